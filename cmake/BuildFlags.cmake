@@ -1,0 +1,14 @@
+# korvex_flags: how our own code is compiled; private to this tree, never a consumer's business.
+add_library(korvex_flags INTERFACE)
+target_compile_options(korvex_flags INTERFACE
+  -Wall -Wextra -Wpedantic -Wconversion -Wshadow
+  # __FILE__ in assertions reads "src/..." wherever the tree lies.
+  "-fmacro-prefix-map=${PROJECT_SOURCE_DIR}/=")
+if(KORVEX_WERROR)
+  target_compile_options(korvex_flags INTERFACE -Werror)
+endif()
+if(KORVEX_SANITIZE)
+  set(sanitize -fsanitize=${KORVEX_SANITIZE} -fno-sanitize-recover=all -fno-omit-frame-pointer)
+  target_compile_options(korvex_flags INTERFACE ${sanitize})
+  target_link_options(korvex_flags INTERFACE ${sanitize})
+endif()

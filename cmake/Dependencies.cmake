@@ -1,0 +1,5 @@
+set(THREADS_PREFER_PTHREAD_FLAG ON)
+find_package(Threads REQUIRED)
+find_package(PkgConfig REQUIRED)
+pkg_check_modules(popt REQUIRED IMPORTED_TARGET popt)
+find_package(LibXml2 REQUIRED)

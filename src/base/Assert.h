@@ -1,0 +1,15 @@
+#pragma once
+
+inline namespace korvex {
+
+// Prints "FILE:LINE: failed assertion `CONDITION'" to standard error and aborts.
+[[noreturn]] void assertionFailed(const char* file, unsigned line, const char* condition) noexcept;
+
+}  // namespace korvex
+
+// For programming errors; always on. The condition's own text is what is printed.
+#define KORVEX_ASSERT(condition) KORVEX_ASSERT_AS(condition, #condition)
+
+// The same with the text given, where it differs from the code's way to say it.
+#define KORVEX_ASSERT_AS(condition, text) \
+    ((condition) ? static_cast<void>(0) : ::korvex::assertionFailed(__FILE__, __LINE__, text))

@@ -1,0 +1,34 @@
+#include "base/PrintfBuffer.h"
+
+#include <cstdio>
+
+inline namespace korvex {
+
+namespace {
+
+int formatInto(char* buf, std::size_t size, const char* fmt, va_list ap) {
+    va_list again;
+    va_copy(again, ap);
+    const int length = std::vsnprintf(buf, size, fmt, again);
+    va_end(again);
+    return length;
+}
+
+}  // namespace
+
+// C99's vsnprintf tells the length that is needed, so one retry is enough; a negative result is a
+// conversion that no buffer can cure.
+PrintfBuffer::PrintfBuffer(const char* fmt, va_list ap) {
+    int length = formatInto(_local, sizeof _local, fmt, ap);
+    if (length >= static_cast<int>(sizeof _local)) {
+        const std::size_t needed = static_cast<std::size_t>(length) + 1;
+        _heap.reset(new char[needed]);
+        length = formatInto(_heap.get(), needed, fmt, ap);
+    }
+    _ok = length >= 0;
+    _size = _ok ? static_cast<std::size_t>(length) : 0;
+    if (!_ok) _heap.reset();
+    if (!_ok) _local[0] = '\0';
+}
+
+}  // namespace korvex

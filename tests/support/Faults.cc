@@ -1,0 +1,237 @@
+#include "support/Faults.h"
+
+#include <fcntl.h>
+#include <pthread.h>
+#include <sys/stat.h>
+#include <sys/time.h>
+#include <sys/uio.h>
+#include <time.h>
+#include <unistd.h>
+
+#include <algorithm>
+#include <atomic>
+#include <cerrno>
+#include <cstdarg>
+#include <cstddef>
+#include <cstdio>
+
+namespace testsupport {
+
+namespace {
+
+constexpr unsigned long kNever = 0;
+constexpr unsigned long kUnlimited = static_cast<unsigned long>(-1);
+
+struct Plan {
+    std::atomic<bool> active{false};
+    std::atomic<unsigned long> calls{0};
+    std::atomic<unsigned long> failAt{kNever};
+    std::atomic<bool> persistent{false};
+    std::atomic<int> error{0};  // 0 with failAt set: a short count instead of a failure
+    std::atomic<unsigned long> limit{kUnlimited};
+};
+
+Plan plans[static_cast<std::size_t>(Call::COUNT)];
+
+Plan& planOf(Call call) {
+    return plans[static_cast<std::size_t>(call)];
+}
+
+struct Verdict {
+    int error = 0;
+    unsigned long limit = kUnlimited;
+};
+
+Verdict judge(Call call) {
+    Plan& plan = planOf(call);
+    if (!plan.active) return {};
+    const unsigned long nth = ++plan.calls;
+    const unsigned long at = plan.failAt;
+    if (at == kNever || nth < at || (nth > at && !plan.persistent)) return {};
+    return {plan.error, plan.limit};
+}
+
+bool fails(Call call) {
+    const Verdict verdict = judge(call);
+    if (verdict.error != 0) errno = verdict.error;
+    return verdict.error != 0;
+}
+
+}  // namespace
+
+CountCalls::CountCalls(Call call) : _call(call) {
+    Plan& plan = planOf(call);
+    plan.calls = 0;
+    plan.failAt = kNever;
+    plan.active = true;
+}
+
+CountCalls::~CountCalls() {
+    planOf(_call).active = false;
+}
+
+unsigned long CountCalls::count() const {
+    return planOf(_call).calls;
+}
+
+FailNth::FailNth(Call call, unsigned long k, int error, Persistence persistence)
+    : CountCalls(call) {
+    Plan& plan = planOf(call);
+    plan.error = error;
+    plan.limit = kUnlimited;
+    plan.persistent = persistence == FROM_THEN_ON;
+    plan.failAt = k;
+}
+
+bool FailNth::fired() const {
+    return count() >= planOf(_call).failAt;
+}
+
+ShortNth::ShortNth(Call call, unsigned long k, unsigned long count) : CountCalls(call) {
+    Plan& plan = planOf(call);
+    plan.error = 0;
+    plan.limit = count;
+    plan.persistent = false;
+    plan.failAt = k;
+}
+
+bool ShortNth::fired() const {
+    return count() >= planOf(_call).failAt;
+}
+
+}  // namespace testsupport
+
+using testsupport::Call;
+using testsupport::fails;
+using testsupport::judge;
+
+// One hook a call. FORWARD covers those that only fail or go through.
+#define FORWARD(failure, result, name, parameters, arguments) \
+    result __real_##name parameters;                          \
+    result __wrap_##name parameters {                         \
+        if (fails(Call::name)) return failure;                \
+        return __real_##name arguments;                       \
+    }
+
+// The same for calls that return their error number.
+#define FORWARD_NUMBER(call, name, parameters, arguments)      \
+    int __real_##name parameters;                              \
+    int __wrap_##name parameters {                             \
+        if (const int error = judge(call).error) return error; \
+        return __real_##name arguments;                        \
+    }
+
+extern "C" {
+
+int __real_open(const char* path, int flags, mode_t mode);
+int __wrap_open(const char* path, int flags, ...) {
+    va_list ap;
+    va_start(ap, flags);
+    const mode_t mode = (flags & O_CREAT) != 0 ? va_arg(ap, mode_t) : 0;
+    va_end(ap);
+    return fails(Call::open) ? -1 : __real_open(path, flags, mode);
+}
+
+int __real_fcntl(int fd, int command, long argument);
+int __wrap_fcntl(int fd, int command, ...) {
+    va_list ap;
+    va_start(ap, command);
+    const long argument = va_arg(ap, long);
+    va_end(ap);
+    return fails(Call::fcntl) ? -1 : __real_fcntl(fd, command, argument);
+}
+
+ssize_t __real_read(int fd, void* p, size_t n);
+ssize_t __wrap_read(int fd, void* p, size_t n) {
+    const auto verdict = judge(Call::read);
+    if (verdict.error != 0) {
+        errno = verdict.error;
+        return -1;
+    }
+    return __real_read(fd, p, std::min<size_t>(n, verdict.limit));
+}
+
+ssize_t __real_write(int fd, const void* p, size_t n);
+ssize_t __wrap_write(int fd, const void* p, size_t n) {
+    const auto verdict = judge(Call::write);
+    if (verdict.error != 0) {
+        errno = verdict.error;
+        return -1;
+    }
+    return __real_write(fd, p, std::min<size_t>(n, verdict.limit));
+}
+
+size_t __real_fread(void* p, size_t size, size_t n, FILE* file);
+size_t __wrap_fread(void* p, size_t size, size_t n, FILE* file) {
+    const auto verdict = judge(Call::fread);
+    if (verdict.error != 0) {
+        errno = verdict.error;
+        return 0;
+    }
+    return __real_fread(p, size, std::min<size_t>(n, verdict.limit), file);
+}
+
+size_t __real_fwrite(const void* p, size_t size, size_t n, FILE* file);
+size_t __wrap_fwrite(const void* p, size_t size, size_t n, FILE* file) {
+    const auto verdict = judge(Call::fwrite);
+    if (verdict.error != 0) {
+        errno = verdict.error;
+        return 0;
+    }
+    return __real_fwrite(p, size, std::min<size_t>(n, verdict.limit), file);
+}
+
+int __real_close(int fd);
+int __wrap_close(int fd) {
+    const int error = judge(Call::close).error;
+    const int result = __real_close(fd);
+    if (error == 0) return result;
+    errno = error;
+    return -1;
+}
+
+int __real_fclose(FILE* file);
+int __wrap_fclose(FILE* file) {
+    const int error = judge(Call::fclose).error;
+    const int result = __real_fclose(file);
+    if (error == 0) return result;
+    errno = error;
+    return EOF;
+}
+
+FORWARD(-1, ssize_t, writev, (int fd, const struct iovec* vec, int n), (fd, vec, n))
+FORWARD(-1, int, fstat, (int fd, struct stat* st), (fd, st))
+FORWARD(-1, int, stat, (const char* path, struct stat* st), (path, st))
+FORWARD(-1, off_t, lseek, (int fd, off_t off, int whence), (fd, off, whence))
+FORWARD(-1, int, fsync, (int fd), (fd))
+FORWARD(-1, int, rename, (const char* from, const char* to), (from, to))
+FORWARD(-1, int, unlink, (const char* path), (path))
+FORWARD(nullptr, FILE*, fopen, (const char* path, const char* mode), (path, mode))
+FORWARD(nullptr, void*, malloc, (size_t n), (n))
+FORWARD(-1, int, gettimeofday, (struct timeval * tv, void* zone), (tv, zone))
+FORWARD(nullptr, struct tm*, localtime_r, (const time_t* t, struct tm* out), (t, out))
+FORWARD_NUMBER(Call::strerror_r, __xpg_strerror_r, (int number, char* buf, size_t n),
+               (number, buf, n))
+FORWARD_NUMBER(Call::pthread_create, pthread_create,
+               (pthread_t * thread, const pthread_attr_t* attr, void* (*start)(void*), void* arg),
+               (thread, attr, start, arg))
+FORWARD_NUMBER(Call::pthread_attr_init, pthread_attr_init, (pthread_attr_t * attr), (attr))
+FORWARD_NUMBER(Call::pthread_attr_setstacksize, pthread_attr_setstacksize,
+               (pthread_attr_t * attr, size_t size), (attr, size))
+FORWARD_NUMBER(Call::pthread_mutex_init, pthread_mutex_init,
+               (pthread_mutex_t * mutex, const pthread_mutexattr_t* attr), (mutex, attr))
+FORWARD_NUMBER(Call::pthread_mutex_lock, pthread_mutex_lock, (pthread_mutex_t * mutex), (mutex))
+FORWARD_NUMBER(Call::pthread_cond_init, pthread_cond_init,
+               (pthread_cond_t * cond, const pthread_condattr_t* attr), (cond, attr))
+FORWARD_NUMBER(Call::pthread_cond_wait, pthread_cond_wait,
+               (pthread_cond_t * cond, pthread_mutex_t* mutex), (cond, mutex))
+FORWARD_NUMBER(Call::pthread_cond_clockwait, pthread_cond_clockwait,
+               (pthread_cond_t * cond, pthread_mutex_t* mutex, clockid_t clock,
+                const struct timespec* until),
+               (cond, mutex, clock, until))
+FORWARD_NUMBER(Call::pthread_key_create, pthread_key_create,
+               (pthread_key_t * key, void (*cleanup)(void*)), (key, cleanup))
+FORWARD_NUMBER(Call::pthread_setspecific, pthread_setspecific,
+               (pthread_key_t key, const void* value), (key, value))
+
+}  // extern "C"

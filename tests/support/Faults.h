@@ -1,0 +1,74 @@
+#pragma once
+
+namespace testsupport {
+
+// The library's calls that a test can count or make fail. They reach the hooks through the
+// linker's --wrap (WrappedCalls.cmake), so the product code knows nothing of them. Calls made
+// inside the C and C++ libraries themselves are not seen.
+enum class Call {
+    open,
+    read,
+    write,
+    writev,
+    close,
+    fstat,
+    stat,
+    lseek,
+    fcntl,
+    fsync,
+    rename,
+    unlink,
+    fopen,
+    fread,
+    fwrite,
+    fclose,
+    malloc,
+    gettimeofday,
+    localtime_r,
+    strerror_r,
+    pthread_create,
+    pthread_attr_init,
+    pthread_attr_setstacksize,
+    pthread_mutex_init,
+    pthread_mutex_lock,
+    pthread_cond_init,
+    pthread_cond_wait,
+    pthread_cond_clockwait,
+    pthread_key_create,
+    pthread_setspecific,
+    COUNT
+};
+
+// Counts a call for as long as this object lives. One object a call at a time.
+class CountCalls {
+  public:
+    explicit CountCalls(Call call);
+    CountCalls(const CountCalls&) = delete;
+    CountCalls& operator=(const CountCalls&) = delete;
+    virtual ~CountCalls();
+
+    unsigned long count() const;
+
+  protected:
+    const Call _call;
+};
+
+// Lets the k-th call (from 1) from now on fail with `error`, in any thread: errno for the system
+// calls, the returned number for pthread calls and strerror_r. A close or fclose still closes.
+class FailNth : public CountCalls {
+  public:
+    enum Persistence { ONCE, FROM_THEN_ON };
+    FailNth(Call call, unsigned long k, int error, Persistence persistence = ONCE);
+
+    bool fired() const;
+};
+
+// Lets the k-th read, write, fread or fwrite move `count` bytes at the most.
+class ShortNth : public CountCalls {
+  public:
+    ShortNth(Call call, unsigned long k, unsigned long count);
+
+    bool fired() const;
+};
+
+}  // namespace testsupport
