@@ -1,0 +1,32 @@
+#pragma once
+
+#include <korvex/util/Thread.h>
+
+inline namespace korvex {
+
+// Which workers there are, and which of them the calling thread is.
+class ActiveThreads {
+  public:
+    // Registers the calling thread as `thrptr`, once; it is struck off when it ends.
+    static void add(Thread* thrptr);
+    // The calling thread's object, or null.
+    static Thread* current() { return _current; }
+    // The calling thread's object is gone: current() must not give it away any more.
+    static void forgetCurrent() { _current = nullptr; }
+
+  private:
+    static void countIn();
+    static void setSlot(Thread* thrptr);
+    static void remove(void* unused);
+
+    // A thread-specific key exists only while there are workers: its clean-up strikes them off and
+    // the last one deletes it. So no thread may look itself up by the key without a lock, and this
+    // plain pointer beside it answers instead. It needs no destruction, so it is readable in
+    // ending threads too.
+    static inline thread_local Thread* _current = nullptr;
+
+    static TSP_Implementor* _ptrs;
+    static int _nthreads;
+};
+
+}  // namespace korvex

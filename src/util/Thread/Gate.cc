@@ -1,0 +1,38 @@
+#include "util/Thread/Gate.h"
+
+#include "base/Assert.h"
+#include "base/NeverDestroyed.h"
+
+inline namespace korvex {
+
+namespace {
+
+// One lock for all gates: they are used once a thread.
+Mutex& readyToRunLock() {
+    static NeverDestroyed<Mutex> ready_to_run_lock;
+    return *ready_to_run_lock;
+}
+
+}  // namespace
+
+void Thread::Gate::open() {
+    const ScopedMutex lock(readyToRunLock());
+    KORVEX_ASSERT(!_ready_to_run);
+    _ready_to_run = true;
+    _ready_to_run_cond.wake_all();
+}
+
+void Thread::Gate::abandon() {
+    const ScopedMutex lock(readyToRunLock());
+    _abandoned = true;
+    _ready_to_run_cond.wake_all();
+}
+
+bool Thread::Gate::pass() {
+    ScopedMutex lock(readyToRunLock());
+    while (!_ready_to_run && !_abandoned)
+        _ready_to_run_cond.wait(lock);
+    return _ready_to_run;
+}
+
+}  // namespace korvex

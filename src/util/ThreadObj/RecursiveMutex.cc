@@ -1,0 +1,42 @@
+#include <korvex/util/ThreadObj.h>
+
+#include "base/Assert.h"
+
+inline namespace korvex {
+
+void RecursiveMutex::claim() {
+    const ScopedMutex lock(_owner_mutex);
+    _owner = PthreadToken::self();
+    _owner_valid = true;
+    _owner_count = 1;
+}
+
+bool RecursiveMutex::tryLock() {
+    if (_mutex.tryLock()) {
+        claim();
+        return true;
+    }
+    const ScopedMutex lock(_owner_mutex);
+    if (!_owner_valid || !(_owner == PthreadToken::self())) return false;
+    KORVEX_ASSERT(_owner_count > 0);
+    ++_owner_count;
+    return true;
+}
+
+void RecursiveMutex::lock() {
+    if (tryLock()) return;
+    _mutex.lock();
+    claim();
+}
+
+void RecursiveMutex::unlock() {
+    {
+        const ScopedMutex lock(_owner_mutex);
+        KORVEX_ASSERT(_owner_count > 0);
+        if (--_owner_count > 0) return;
+        _owner_valid = false;
+    }
+    _mutex.unlock();
+}
+
+}  // namespace korvex

@@ -1,0 +1,38 @@
+#include <korvex/util/ThreadObj.h>
+
+#include <exception>
+
+inline namespace korvex {
+
+namespace {
+
+// A destructor's work: what it throws must not meet an exception that is on its way already.
+template <class Work>
+void unlessUnwinding(int exceptionsBefore, Work work) {
+    try {
+        work();
+    } catch (...) {
+        if (std::uncaught_exceptions() == exceptionsBefore) throw;
+    }
+}
+
+}  // namespace
+
+ScopedMutex::ScopedMutex(Mutex& mutex) : _mutex(mutex), _exceptions(std::uncaught_exceptions()) {
+    _mutex.lock();
+}
+
+ScopedMutex::~ScopedMutex() noexcept(false) {
+    unlessUnwinding(_exceptions, [this] { _mutex.unlock(); });
+}
+
+ScopedMutexUnlocker::ScopedMutexUnlocker(Mutex& mutex)
+    : _mutex(mutex), _exceptions(std::uncaught_exceptions()) {
+    _mutex.unlock();
+}
+
+ScopedMutexUnlocker::~ScopedMutexUnlocker() noexcept(false) {
+    unlessUnwinding(_exceptions, [this] { _mutex.lock(); });
+}
+
+}  // namespace korvex
