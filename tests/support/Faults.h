@@ -25,6 +25,7 @@ enum class Call {
     malloc,
     gettimeofday,
     localtime_r,
+    strftime,
     strerror_r,
     pthread_create,
     pthread_attr_init,

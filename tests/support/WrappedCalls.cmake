@@ -2,7 +2,7 @@
 set(KORVEX_WRAPPED_CALLS
   open read write writev close fstat stat lseek fcntl fsync rename unlink
   fopen fread fwrite fclose malloc
-  gettimeofday localtime_r __xpg_strerror_r
+  gettimeofday localtime_r strftime __xpg_strerror_r
   pthread_create pthread_attr_init pthread_attr_setstacksize pthread_mutex_init
   pthread_mutex_lock pthread_cond_init pthread_cond_wait pthread_cond_clockwait pthread_key_create
   pthread_setspecific)

@@ -1,0 +1,119 @@
+#pragma once
+
+// The front door of logging: this one include gives all of it.
+#include <korvex/util/Logger/LogAppender.h>
+#include <korvex/util/Logger/LogChannel.h>
+#include <korvex/util/Logger/LogEpoch.h>
+#include <korvex/util/Logger/LogFormat.h>
+#include <korvex/util/Logger/LogFormattedDate.h>
+#include <korvex/util/Logger/LogLevel.h>
+#include <korvex/util/Logger/LogMsgMetadata.h>
+#include <korvex/util/Logger/ValidUint.h>
+#include <korvex/util/Pathname.h>
+
+#include <atomic>
+#include <cstdarg>
+#include <exception>
+#include <string>
+
+inline namespace korvex {
+
+// A module's voice: a named front end, usually a file-level static, that writes to the channel of
+// the same name. Cheap to build and to copy.
+//
+//     static Logger logger("net");
+//     logger.warn("%s: lost after %d bytes: %m", peer, count);
+//
+// Works at any time. Before Logger::initialize, messages of INFO and above go to standard error as
+// they are; through a logger that is not even constructed (another file's static) every message
+// goes there behind its level's name. Static destructors, exit handlers and threads that outlive
+// main may log too.
+//
+// The level methods never throw, leave errno as it was and may be called from any thread. Their
+// printf forms take printf(3)'s conversions and %m, the text of the errno at the call. (g++
+// -Wpedantic calls a literal %m no ISO C++; __extension__ before the call silences just that.) A
+// format whose conversion fails is logged unconverted.
+class Logger {
+  public:
+    // `name` is neither copied nor owned: it must outlive the logger and its copies. Once logging
+    // is initialised, binds to the channel of that name, or to the root channel when there is no
+    // such channel yet; before that, waits for initialize(). Throws std::bad_alloc.
+    explicit Logger(const char* name);
+    // A copy has the same name and channel. A copy made before initialize() is not on the list of
+    // loggers waiting for it: until then its messages go to standard error behind their level's
+    // name, after that to the root channel.
+    Logger(const Logger& other);
+    Logger& operator=(const Logger& other);
+    ~Logger();
+
+    void fatal(const char* fmt, ...) noexcept __attribute__((format(printf, 2, 3)));
+    void crit(const char* fmt, ...) noexcept __attribute__((format(printf, 2, 3)));
+    void error(const char* fmt, ...) noexcept __attribute__((format(printf, 2, 3)));
+    void warn(const char* fmt, ...) noexcept __attribute__((format(printf, 2, 3)));
+    void info(const char* fmt, ...) noexcept __attribute__((format(printf, 2, 3)));
+    void debug(const char* fmt, ...) noexcept __attribute__((format(printf, 2, 3)));
+
+    // The text as it stands; no % is interpreted.
+    void fatal(const std::string& text) noexcept;
+    void crit(const std::string& text) noexcept;
+    void error(const std::string& text) noexcept;
+    void warn(const std::string& text) noexcept;
+    void info(const std::string& text) noexcept;
+    void debug(const std::string& text) noexcept;
+
+    // e.what() as it stands.
+    void fatal(const std::exception& e) noexcept;
+    void crit(const std::exception& e) noexcept;
+    void error(const std::exception& e) noexcept;
+    void warn(const std::exception& e) noexcept;
+    void info(const std::exception& e) noexcept;
+    void debug(const std::exception& e) noexcept;
+
+    // Whether debug messages pass the channel: lets a caller skip building a costly text.
+    bool isDebugEnabled() const;
+
+    // The name given to the constructor.
+    const char* getChannelName() const { return _channel_name; }
+
+    // Formats into `out`, replacing its content, with printf(3)'s conversions and %m, the text of
+    // error number `errnum`, or "UNKNOWN ERROR" where strerror_r(3) knows none. `out` may be an
+    // argument too. That text becomes part of the format. A conversion that fails yields the
+    // format itself. Leaves errno alone; throws std::bad_alloc.
+    static void vformat(std::string& out, int errnum, const char* fmt, va_list ap)
+        __attribute__((format(printf, 3, 0)));
+    // The same with the current errno.
+    static void format(std::string& out, const char* fmt, ...)
+        __attribute__((format(printf, 2, 3)));
+    // The same with the error number given.
+    static void format(std::string& out, int errnum, const char* fmt, ...)
+        __attribute__((format(printf, 3, 4)));
+
+    // Marks logging as initialised and binds the loggers built so far. Once per process: a second
+    // call is a failed assertion.
+    static void initialize();
+
+    // Reads the configuration file, sets up appenders and channels as it says, then does the
+    // above. False when the file cannot be opened or ends inside an XML comment; lines that make
+    // no sense are reported on the channel "Logger" and passed over. korvexHome replaces
+    // "${KORVEX_HOME}" in file names. Once per process, on the main thread, before other threads
+    // log; nothing is read again later.
+    static bool initialize(const Pathname& conffile, const Pathname& korvexHome);
+
+    // Sets the minimum of a channel, or of the root channel when `channel` is null, from a level's
+    // name in upper case. False, and the level unchanged, for any other word. Makes the channel if
+    // there is none, even then; only loggers built afterwards will use it. Safe from any thread.
+    static bool setChannelLevel(const char* channel, const std::string& levelstr);
+
+  private:
+    friend class EarlyLoggers;
+    friend class LogFormat;
+
+    LogChannel& channel() const;
+
+    const char* _channel_name;
+    unsigned long _channel_name_len;
+    std::atomic<LogChannel*> _channel{nullptr};  // null: the root channel
+    Logger* _next = nullptr;                     // in the list of loggers that wait
+};
+
+}  // namespace korvex

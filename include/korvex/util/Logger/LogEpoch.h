@@ -1,0 +1,12 @@
+#pragma once
+
+#include <korvex/util/Timeval.h>
+
+inline namespace korvex {
+
+// The moment from which the layouts' %r and %R count: when logging was initialised, or the first
+// call of this function if that came earlier. The same object every time, never destroyed; safe
+// from any thread. Aborts when the clock fails, as Timeval does.
+const Timeval& epoch_timeval();
+
+}  // namespace korvex

@@ -1,0 +1,95 @@
+#pragma once
+
+#include <korvex/util/Logger/LogLevel.h>
+
+#include <cstdarg>
+#include <memory>
+#include <string>
+#include <vector>
+
+inline namespace korvex {
+
+class CachedTm;
+class LogAppender;
+class LogFormattedDate;
+class LogMsgMetadata;
+class Logger;
+
+// A message layout, compiled once from a pattern of literal text and conversions:
+//
+//   %m message          %n newline              %% percent sign
+//   %c channel name     %p level name           %t name of the calling thread
+//   %r milliseconds since epoch_timeval()       %R the same in seconds, cut
+//   %u clock(3) in its own ticks                %d{layout} local date, see LogFormattedDate
+//
+// Between % and the letter: a flag (- pads with blanks after the text, 0 pads with zeros before
+// it), a minimum width, and a precision (".n") beyond which the text is cut. A text that was cut is
+// never padded. Unknown letters and unfinished conversions print nothing.
+//
+// Immutable after construction; apply() may be called from several threads at once.
+class LogFormat {
+  public:
+    // Copies and compiles the pattern. Never fails on its content; throws std::bad_alloc.
+    explicit LogFormat(const char* pattern);
+    LogFormat(const LogFormat&) = delete;
+    LogFormat& operator=(const LogFormat&) = delete;
+    ~LogFormat();
+
+    // Appends the line laid out from the message to `out`. A stamp before the epoch makes %r and
+    // %R very large numbers: the difference is printed as unsigned. Throws what
+    // LogFormattedDate::fmt throws, and std::bad_alloc.
+    void apply(std::string& out, const LogMsgMetadata& md, const std::string& msg) const;
+
+    // The way of every message: level test, metadata, the logger's channel; standard error when
+    // the logger is not usable yet or its channel throws. Never throw, keep errno. The second form
+    // formats as Logger::vformat does, %m being the errno at the call, and only when the level has
+    // passed; a message whose formatting runs out of memory is dropped.
+    static void do_log(Logger* logger, LogLevel level, const std::string& text) noexcept;
+    static void do_log(Logger* logger, LogLevel level, const char* fmt, va_list ap) noexcept
+        __attribute__((format(printf, 3, 0)));
+
+    // Logs one of the logging system's own messages on the channel "Logger". Neither `skip` (null
+    // for none) nor any other appender for which this thread is already reporting a failure
+    // receives it; when no appender is left it goes to standard error. Never throws, keeps errno.
+    static void internal(const LogAppender* skip, LogLevel level, const char* fmt, ...) noexcept
+        __attribute__((format(printf, 3, 4)));
+
+    // True when a message through `logger` must go straight to standard error: logging is not
+    // initialised and `logger` was not constructed yet (a static object of a source file whose
+    // initialisers have not run). Takes a lock before initialisation only.
+    static bool check_for_unitialized_logger(const Logger* logger);
+
+  private:
+    struct Atom {
+        enum What {
+            MSG = 0,
+            STR = 1,
+            CATEGORY = 2,
+            LEVEL = 3,
+            THREADNAME = 4,
+            EPOCH_MSEC = 5,
+            EPOCH_SEC = 6,
+            TIME_PROC = 7,
+            TIME_FMT = 8
+        };
+        What what;
+        union {
+            const char* str;                // STR: points into _fmt, or at a constant
+            const LogFormattedDate* fdate;  // TIME_FMT: owned by _dates
+        } arg;
+        unsigned long slen;  // STR: the length of arg.str
+        unsigned int minw;   // shorter texts are padded
+        unsigned int maxw;   // longer texts are cut; all bits set: unlimited
+        char justify;        // what pads before the text; 0: blanks after it
+    };
+    class Compiler;
+    class Line;
+
+    Atom* new_atom();
+
+    std::string _fmt;
+    std::vector<Atom> _atoms;
+    std::vector<std::unique_ptr<const LogFormattedDate>> _dates;
+};
+
+}  // namespace korvex

@@ -1,0 +1,56 @@
+#pragma once
+
+// A program may well be built with -DDEBUG, or include a header that defines ERROR. The macros are
+// put aside while the enumerators are declared and come back afterwards, so that such a program
+// compiles as long as it does not name these levels itself; where it must, `LogLevel` values are
+// reachable through #undef or the numbers below.
+#pragma push_macro("DEBUG")
+#pragma push_macro("INFO")
+#pragma push_macro("NOTICE")
+#pragma push_macro("WARN")
+#pragma push_macro("ERROR")
+#pragma push_macro("CRIT")
+#pragma push_macro("ALERT")
+#pragma push_macro("FATAL")
+#pragma push_macro("EMERG")
+#undef DEBUG
+#undef INFO
+#undef NOTICE
+#undef WARN
+#undef ERROR
+#undef CRIT
+#undef ALERT
+#undef FATAL
+#undef EMERG
+
+inline namespace korvex {
+
+// How grave a message is. A message passes a channel when its level is greater than or equal to
+// the channel's minimum. Logger has no methods for NOTICE, ALERT and EMERG: they serve as minima.
+enum LogLevel : int {
+    DEBUG = 0,
+    INFO = 1,
+    NOTICE = 2,
+    WARN = 3,
+    ERROR = 4,
+    CRIT = 5,
+    ALERT = 6,
+    FATAL = 7,
+    EMERG = 8
+};
+
+// The level's name ("DEBUG" ... "EMERG"), or "???" for any other value; its length in bytes goes
+// to *len, which must not be null. The text lives for ever. Never fails; safe from any thread.
+const char* loglevel2str(unsigned long* len, LogLevel level);
+
+}  // namespace korvex
+
+#pragma pop_macro("DEBUG")
+#pragma pop_macro("INFO")
+#pragma pop_macro("NOTICE")
+#pragma pop_macro("WARN")
+#pragma pop_macro("ERROR")
+#pragma pop_macro("CRIT")
+#pragma pop_macro("ALERT")
+#pragma pop_macro("FATAL")
+#pragma pop_macro("EMERG")

@@ -1,0 +1,129 @@
+#include <korvex/util/Logger.h>
+
+#include "base/NeverDestroyed.h"
+#include "util/Logger/AppenderReport.h"
+#include "util/Logger/RootObjects.h"
+
+#include <unistd.h>
+
+#include <algorithm>
+#include <cstdlib>
+#include <limits>
+#include <memory>
+#include <string_view>
+#include <vector>
+
+inline namespace korvex {
+
+namespace {
+
+constexpr std::string_view shome = "${KORVEX_HOME}";
+
+Pathname expandHome(std::string_view val, const Pathname& korvexHome) {
+    if (korvexHome.empty() || val.substr(0, shome.size()) != shome) {
+        return Pathname(std::string(val));
+    }
+    return Pathname(korvexHome + std::string(val.substr(shome.size())));
+}
+
+// Layouts are shared with threads that may be writing, so one that was replaced stays.
+const LogFormat* makeLayout(const char* pattern) {
+    static NeverDestroyed<std::vector<std::unique_ptr<const LogFormat>>> layouts;
+    (*layouts).push_back(std::make_unique<const LogFormat>(pattern));
+    return (*layouts).back().get();
+}
+
+// The layout of that name; null for "PatternLayout", whose pattern is an attribute of its own.
+// False when there is no such name.
+bool findNamedLayout(std::string_view name, const LogFormat*& layout) {
+    layout = nullptr;
+    if (name == "BasicLayout") {
+        static const LogFormat* const bl = makeLayout("%R %p %c %m%n");
+        layout = bl;
+        return true;
+    }
+    if (name == "SimpleLayout") {
+        static const LogFormat* const sl = makeLayout("%-8p: %m%n");
+        layout = sl;
+        return true;
+    }
+    return name == "PatternLayout";
+}
+
+// A number beyond 32 bits is more backups than anybody has: it counts as the largest.
+std::uint32_t saturated(const char* digits) {
+    const unsigned long long n = std::strtoull(digits, nullptr, 10);
+    constexpr unsigned long long most = std::numeric_limits<std::uint32_t>::max();
+    return static_cast<std::uint32_t>(std::min(n, most));
+}
+
+}  // namespace
+
+bool LogAppender::setAttribute(const std::string& aname, const char* val,
+                               const Pathname& korvexHome) {
+    if (aname == "fileName") {
+        if (this != &rootAppender()) closeFd();
+        _filename = expandHome(val, korvexHome);
+        return true;
+    }
+    if (aname == "maxFileSize") {
+        if (!isValidUint(val)) return false;
+        // Beyond the signed range the limit turns negative and so, like 0, is none.
+        _maxSize = static_cast<std::int64_t>(std::strtoull(val, nullptr, 10));
+        return true;
+    }
+    if (aname == "maxBackupIndex") {
+        if (!isValidUint(val)) return false;
+        _maxBackupIndex = saturated(val);
+        return true;
+    }
+    if (aname == "layout") {
+        const LogFormat* named = nullptr;
+        if (!findNamedLayout(val, named)) return false;
+        if (named != nullptr) _fmt = named;
+        return true;
+    }
+    if (aname == "layout.ConversionPattern") {
+        _fmt = makeLayout(val);
+        return true;
+    }
+    return false;
+}
+
+void LogAppender::finalSetup(const char* name) {
+    if (_fmt == nullptr) _fmt = &rootAppender().layout();
+    if (_filename.empty()) {
+        if (!_fd.valid()) {
+            LogFormat::internal(this, WARN, "Appender \"%s\" has no filename, assuming stderr",
+                                name);
+            _fd = FileDescriptor(STDERR_FILENO);
+        }
+        if (_maxBackupIndex != 0) {
+            LogFormat::internal(this, WARN,
+                                "Appender \"%s\" has maxBackupIndex set without specifying a "
+                                "filename, ignoring",
+                                name);
+            _maxBackupIndex = 0;
+        }
+        if (_maxSize > 0) {
+            LogFormat::internal(
+                this, WARN,
+                "Appender \"%s\" has maxSize set without specifying a filename, ignoring", name);
+            _maxSize = 0;
+        }
+    }
+    if (_maxBackupIndex != 0 && _maxSize == 0) {
+        LogFormat::internal(
+            this, WARN,
+            "Appender \"%s\" has maxBackupIndex set without specifying maxSize, ignoring", name);
+        _maxBackupIndex = 0;
+    }
+    if (writesToFile()) {
+        Report report(this);
+        openFile(report);
+        report.deliver();
+        closeFd();
+    }
+}
+
+}  // namespace korvex

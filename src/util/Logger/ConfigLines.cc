@@ -1,0 +1,89 @@
+#include "util/Logger/ConfigLines.h"
+
+#include "base/Assert.h"
+
+#include <algorithm>
+#include <cstring>
+#include <string_view>
+
+inline namespace korvex {
+
+namespace {
+
+constexpr std::string_view kCommentStart = "<!--";
+constexpr std::string_view kCommentEnd = "-->";
+
+bool endsWith(const std::string& text, std::string_view tail) {
+    return text.size() >= tail.size() &&
+           text.compare(text.size() - tail.size(), tail.size(), tail) == 0;
+}
+
+// Up to one character beyond the last one before the "#" that is no blank; empty without one.
+void cutToContent(std::string& line) {
+    const std::size_t comment = std::min(line.find('#'), line.size());
+    const std::size_t last = comment == 0 ? line.npos : line.find_last_not_of(" \t", comment - 1);
+    line.resize(last == line.npos ? 0 : std::min(last + 2, line.size()));
+}
+
+}  // namespace
+
+bool read_line(std::string& result, std::FILE* ifile) {
+    result.clear();
+    char buf[128];
+    for (;;) {
+        const char* const p = std::fgets(buf, sizeof buf, ifile);
+        if (p == nullptr) return !result.empty();
+        KORVEX_ASSERT(p == buf);
+        const std::size_t length = std::strcspn(p, "\n");
+        result.append(p, length);
+        if (p[length] == '\n') return true;
+    }
+}
+
+bool ConfigLines::nextRaw() {
+    if (!read_line(_line, _file)) return false;
+    ++lineno_;
+    return true;
+}
+
+bool ConfigLines::next(std::string& content) {
+    while (nextRaw()) {
+        joinAroundComments(content);
+        cutToContent(content);
+        if (!content.empty()) return true;
+    }
+    return false;
+}
+
+// Copies the line up to and including its "#", leaving out XML comments. Text around a comment
+// grows together and may so form the start of another one; a single pass sees that too, because
+// it looks at what it has copied and not at the line.
+bool ConfigLines::joinAroundComments(std::string& joined) {
+    joined.clear();
+    for (std::size_t pos = 0; pos < _line.size();) {
+        const char c = _line[pos++];
+        joined += c;
+        if (c == '#') return true;
+        if (c != '-' || !endsWith(joined, kCommentStart)) continue;
+        joined.resize(joined.size() - kCommentStart.size());
+        xml_comment_startline_ = lineno_;
+        if (!handle_xml_comment(pos)) return false;
+        xml_comment_startline_ = kNone;
+    }
+    return true;
+}
+
+// Goes on behind the comment's end, on whatever line that is; false when the file ends before it.
+bool ConfigLines::handle_xml_comment(std::size_t& pos) {
+    for (;;) {
+        const std::size_t end = _line.find(kCommentEnd, pos);
+        if (end != _line.npos) {
+            pos = end + kCommentEnd.size();
+            return true;
+        }
+        if (!nextRaw()) return false;
+        pos = 0;
+    }
+}
+
+}  // namespace korvex

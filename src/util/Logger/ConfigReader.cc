@@ -1,0 +1,133 @@
+#include "util/Logger/ConfigReader.h"
+
+#include <korvex/util/Logger.h>
+
+#include "util/Logger/RootObjects.h"
+
+#include <algorithm>
+#include <string_view>
+
+inline namespace korvex {
+
+namespace {
+
+constexpr std::string_view kBlanks = " \t";
+constexpr std::string_view kPrefix = "log4cpp.";
+
+// The first position from `from` on that holds one of the delimiters; the line's size when none.
+std::size_t findDelimiter(const std::string& line, std::size_t from, std::string_view delimiters) {
+    return std::min(line.find_first_of(delimiters, from), line.size());
+}
+
+std::size_t skipBlanks(const std::string& line, std::size_t from) {
+    return std::min(line.find_first_not_of(kBlanks, from), line.size());
+}
+
+bool isAt(const std::string& line, std::size_t pos, char c) {
+    return pos < line.size() && line[pos] == c;
+}
+
+// Applies "name=value", the text behind "category."; false when it says nothing valid.
+bool setup_log_channel(const std::string& cstr) {
+    const std::size_t equals = cstr.find('=');
+    if (equals == cstr.npos) return false;
+    const std::size_t last = equals == 0 ? cstr.npos : cstr.find_last_not_of(kBlanks, equals - 1);
+    const std::string lname = cstr.substr(0, last == cstr.npos ? 0 : last + 1);
+    return LogChannel::find(lname, true)->setConfig(cstr.c_str() + equals + 1);
+}
+
+}  // namespace
+
+ConfigReader::ConfigReader(std::FILE* file, const Pathname& korvexHome)
+    : _lines(file), _korvexHome(korvexHome) {}
+
+void ConfigReader::readAll() {
+    std::string line;
+    while (_lines.next(line))
+        readLine(line);
+}
+
+void ConfigReader::readLine(const std::string& line) {
+    std::size_t key = skipBlanks(line, 0);
+    if (line.compare(key, kPrefix.size(), kPrefix) == 0) key += kPrefix.size();
+    if (key == line.size()) return;
+    const std::size_t keyEnd = findDelimiter(line, key, ".= \t");
+    const std::string_view word = std::string_view(line).substr(key, keyEnd - key);
+    if (keyEnd == line.size()) {
+        addParseError(line, key);
+    } else if (word == "rootCategory") {
+        readRootCategory(line, key, keyEnd);
+    } else if (word == "category" && line[keyEnd] == '.') {
+        cat_cnf.push_back({_lines.lineno(), line.substr(keyEnd + 1)});
+    } else if (word == "appender" && line[keyEnd] == '.') {
+        readAppender(line, keyEnd + 1);
+    } else {
+        addParseError(line, key);
+    }
+}
+
+// The last line of its kind wins.
+void ConfigReader::readRootCategory(const std::string& line, std::size_t key,
+                                    std::size_t afterKey) {
+    const std::size_t equals = skipBlanks(line, afterKey);
+    if (isAt(line, equals, '=')) {
+        root_cnf = {_lines.lineno(), line.substr(equals + 1)};
+    } else {
+        addParseError(line, key);
+    }
+}
+
+// The appender comes into being as soon as its name is known, even if the line fails after that.
+void ConfigReader::readAppender(const std::string& line, std::size_t name) {
+    if (isAt(line, name, ' ') || isAt(line, name, '\t') || isAt(line, name, '=')) {
+        addParseError(line, 0);
+        return;
+    }
+    const std::size_t nameEnd = findDelimiter(line, name, ".= \t");
+    if (nameEnd == line.size()) {
+        addParseError(line, name);
+        return;
+    }
+    LogAppender& la = *LogAppender::find(line.substr(name, nameEnd - name), true);
+    if (line[nameEnd] == '.') {
+        readAttribute(line, nameEnd + 1, la);
+    } else if (!isAt(line, skipBlanks(line, nameEnd), '=')) {
+        addParseError(line, name);
+    }
+}
+
+void ConfigReader::readAttribute(const std::string& line, std::size_t name, LogAppender& la) {
+    const std::size_t nameEnd = findDelimiter(line, name, "= \t");
+    if (nameEnd == line.size()) {
+        addParseError(line, name);
+        return;
+    }
+    const std::size_t equals = skipBlanks(line, nameEnd);
+    if (!isAt(line, equals, '=')) {
+        addParseError(line, 0);
+        return;
+    }
+    const std::string aname = line.substr(name, nameEnd - name);
+    const std::string attribute_val = line.substr(skipBlanks(line, equals + 1));
+    if (!la.setAttribute(aname, attribute_val.c_str(), _korvexHome)) addParseError(line, 0);
+}
+
+void ConfigReader::addParseError(const std::string& line, std::size_t from) {
+    _parseErrors.push_back({_lines.lineno(), line.substr(from)});
+}
+
+void ConfigReader::applyRoot() {
+    if (!rootChannel().setConfig(root_cnf.context.c_str())) _parseErrors.push_back(root_cnf);
+}
+
+void ConfigReader::applyCategories() {
+    while (!cat_cnf.empty()) {
+        if (setup_log_channel(cat_cnf.front().context)) {
+            cat_cnf.pop_front();
+        } else {
+            _parseErrors.splice(_parseErrors.end(), cat_cnf, cat_cnf.begin());
+        }
+    }
+}
+
+}  // namespace korvex

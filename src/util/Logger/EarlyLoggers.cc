@@ -1,0 +1,70 @@
+#include "util/Logger/EarlyLoggers.h"
+
+#include "base/Assert.h"
+#include "base/NeverDestroyed.h"
+#include "util/Logger/NologLock.h"
+
+inline namespace korvex {
+
+std::atomic<bool> logger_initialized{false};
+Logger* EarlyLoggers::uninitialized_loggers = nullptr;
+
+namespace {
+
+Mutex& listMutex() {
+    static NeverDestroyed<Mutex> mutex;
+    return *mutex;
+}
+
+}  // namespace
+
+void EarlyLoggers::bind(Logger& logger) {
+    logger._channel.store(LogChannel::find(logger._channel_name, false), std::memory_order_release);
+}
+
+void EarlyLoggers::add(Logger& logger) {
+    const NologLock lock(listMutex());
+    if (logger_initialized) {
+        bind(logger);
+        return;
+    }
+    logger._next = uninitialized_loggers;
+    uninitialized_loggers = &logger;
+}
+
+void EarlyLoggers::remove(Logger& logger) {
+    const NologLock lock(listMutex());
+    for (Logger** link = &uninitialized_loggers; *link != nullptr; link = &(*link)->_next) {
+        if (*link == &logger) {
+            *link = logger._next;
+            return;
+        }
+    }
+}
+
+bool EarlyLoggers::isEmptyOrLacks(const Logger& logger) {
+    const NologLock lock(listMutex());
+    for (const Logger* l = uninitialized_loggers; l != nullptr; l = l->_next) {
+        if (l == &logger) return false;
+    }
+    return true;
+}
+
+void EarlyLoggers::initialize() {
+    const NologLock lock(listMutex());
+    KORVEX_ASSERT(!logger_initialized);
+    epoch_timeval();
+    logger_initialized = true;
+    while (Logger* const logger = uninitialized_loggers) {
+        bind(*logger);
+        uninitialized_loggers = logger->_next;
+        logger->_next = nullptr;
+    }
+}
+
+bool LogFormat::check_for_unitialized_logger(const Logger* logger) {
+    if (logger_initialized.load(std::memory_order_acquire)) return false;
+    return EarlyLoggers::isEmptyOrLacks(*logger);
+}
+
+}  // namespace korvex

@@ -1,0 +1,30 @@
+#pragma once
+
+#include <korvex/util/Logger.h>
+
+#include <atomic>
+
+inline namespace korvex {
+
+// Whether Logger::initialize has run. Constant-initialised, so that any static initialiser may ask.
+extern std::atomic<bool> logger_initialized;
+
+// The loggers built before initialisation. Threads may start, build loggers and log early, so the
+// list has a lock; nothing here is called for a bound logger.
+class EarlyLoggers {
+  public:
+    // Puts the logger on the list, or binds it when initialisation was faster.
+    static void add(Logger& logger);
+    // Takes it off the list, if it is there.
+    static void remove(Logger& logger);
+    static bool isEmptyOrLacks(const Logger& logger);
+    // Marks logging as initialised and binds every logger on the list, newest first.
+    static void initialize();
+
+  private:
+    static void bind(Logger& logger);
+
+    static Logger* uninitialized_loggers;
+};
+
+}  // namespace korvex

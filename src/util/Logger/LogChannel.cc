@@ -1,0 +1,108 @@
+#include <korvex/util/Logger/LogAppender.h>
+#include <korvex/util/Logger/LogChannel.h>
+#include <korvex/util/Logger/LogMsgMetadata.h>
+
+#include "base/NeverDestroyed.h"
+#include "util/Logger/LevelWords.h"
+#include "util/Logger/NologLock.h"
+#include "util/Logger/Reporting.h"
+#include "util/Logger/RootObjects.h"
+
+#include <cstring>
+#include <map>
+#include <memory>
+
+inline namespace korvex {
+
+namespace {
+
+// Channels are made at any time by setChannelLevel and looked up by loggers being built, so this
+// map, unlike the appenders', has a lock.
+struct Registry {
+    Mutex mutex;
+    std::map<std::string, std::unique_ptr<LogChannel>> channels;
+};
+
+Registry& registry() {
+    static NeverDestroyed<Registry> instance;
+    return *instance;
+}
+
+}  // namespace
+
+LogChannel::LogChannel() : minlevel(INFO) {}
+
+LogChannel::LogChannel(const LogChannel& other)
+    : minlevel(other.minlevel.load(std::memory_order_relaxed)), _appenders(other._appenders) {}
+
+LogChannel* LogChannel::find(const std::string& name, bool create) {
+    Registry& known = registry();
+    const NologLock lock(known.mutex);
+    const auto found = known.channels.find(name);
+    if (found != known.channels.end()) return found->second.get();
+    if (!create) return &rootChannel();
+    auto channel = std::make_unique<LogChannel>(rootChannel());
+    return known.channels.emplace(name, std::move(channel)).first->second.get();
+}
+
+LogChannel* LogChannel::find(const char* name, bool create) {
+    return find(std::string(name), create);
+}
+
+bool LogChannel::setConfig(const char* cstr) {
+    static constexpr char separators[] = " \t,";
+    bool got_appender = false;
+    bool ok = true;
+    for (const char* p = cstr + std::strspn(cstr, separators); *p != '\0';) {
+        const std::size_t length = std::strcspn(p, separators);
+        if (!applyConfWord(std::string(p, length), &got_appender)) ok = false;
+        p += length;
+        p += std::strspn(p, separators);
+    }
+    return ok;
+}
+
+// A level's name is always a level, even where an appender bears the same name.
+bool LogChannel::applyConfWord(const std::string& word, bool* got_appender_p) {
+    if (changeLevel(word)) return true;
+    LogAppender* const appender = LogAppender::find(word, false);
+    if (appender == nullptr) return false;
+    if (!*got_appender_p) {
+        _appenders.clear();
+        *got_appender_p = true;
+    }
+    _appenders.push_back(appender);
+    return true;
+}
+
+bool LogChannel::changeLevel(const std::string& word) {
+    for (const LevelWord& entry : kLevelWords) {
+        if (entry.word == word) {
+            minlevel.store(entry.level, std::memory_order_relaxed);
+            return true;
+        }
+    }
+    return false;
+}
+
+void LogChannel::write(const LogMsgMetadata& mdata, const std::string& msg) {
+    if (_appenders.empty()) rootAppender().write(mdata, msg);
+    for (LogAppender* const appender : _appenders)
+        appender->write(mdata, msg);
+}
+
+bool LogChannel::write(const LogMsgMetadata& mdata, const std::string& msg,
+                       const LogAppender* dont_touch) {
+    bool written = false;
+    const auto offer = [&](LogAppender& appender) {
+        if (&appender == dont_touch || ReportingMark::covers(&appender)) return;
+        appender.write(mdata, msg);
+        written = true;
+    };
+    if (_appenders.empty()) offer(rootAppender());
+    for (LogAppender* const appender : _appenders)
+        offer(*appender);
+    return written;
+}
+
+}  // namespace korvex

@@ -1,0 +1,137 @@
+#include <korvex/util/Logger.h>
+#include <korvex/util/Thread.h>
+
+#include "base/Assert.h"
+#include "util/Logger/LogFormatCompiler.h"
+
+#include <cstdio>
+#include <cstring>
+#include <ctime>
+
+inline namespace korvex {
+
+namespace {
+
+// One piece of a line before it is fitted to its widths. It borrows what it points at.
+struct Text {
+    const char* data;
+    unsigned long size;
+};
+
+Text textOf(const char* s) {
+    return {s, std::strlen(s)};
+}
+
+// A stamp before the epoch prints as a very large number: the difference is read as unsigned.
+unsigned long long msecSinceEpoch(const LogMsgMetadata& md) {
+    return static_cast<unsigned long long>(Timeval::msecDifference(md.stamp, epoch_timeval()));
+}
+
+}  // namespace
+
+// Produces one line: what the atoms of the line share.
+class LogFormat::Line {
+  public:
+    Line(std::string& out, const LogMsgMetadata& md, const std::string& msg)
+        : _out(out), _md(md), _msg(msg) {}
+
+    void append(const Atom& atom) { fit(atom, text(atom)); }
+
+  private:
+    Text text(const Atom& atom);
+    Text category() const;
+    Text level() const;
+    Text number(unsigned long long value);
+    Text date(const LogFormattedDate& layout);
+    void fit(const Atom& atom, const Text& text);
+
+    std::string& _out;
+    const LogMsgMetadata& _md;
+    const std::string& _msg;
+    CachedTm _tm;  // so that every date of the line shows the same local time
+    std::string _dateText;
+    char _digits[21];
+};
+
+Text LogFormat::Line::text(const Atom& atom) {
+    switch (atom.what) {
+        case Atom::MSG:
+            return {_msg.data(), _msg.size()};
+        case Atom::STR:
+            return {atom.arg.str, atom.slen};
+        case Atom::CATEGORY:
+            return category();
+        case Atom::LEVEL:
+            return level();
+        case Atom::THREADNAME:
+            return textOf(Thread::currentName());
+        case Atom::EPOCH_MSEC:
+            return number(msecSinceEpoch(_md));
+        case Atom::EPOCH_SEC:
+            return number(msecSinceEpoch(_md) / 1000);
+        case Atom::TIME_PROC:
+            return number(static_cast<unsigned long long>(std::clock()));
+        case Atom::TIME_FMT:
+            break;
+    }
+    KORVEX_ASSERT_AS(atom.what == Atom::TIME_FMT, "a->what == Atom::TIME_FMT");
+    return date(*atom.arg.fdate);
+}
+
+// A logger whose constructor has not run yet has no name.
+Text LogFormat::Line::category() const {
+    const char* const name = _md.category->_channel_name;
+    return name != nullptr ? Text{name, _md.category->_channel_name_len} : Text{"", 0};
+}
+
+Text LogFormat::Line::level() const {
+    unsigned long len = 0;
+    const char* const name = loglevel2str(&len, _md.level);
+    return {name, len};
+}
+
+Text LogFormat::Line::number(unsigned long long value) {
+    const auto elen =
+        static_cast<unsigned long>(std::snprintf(_digits, sizeof _digits, "%llu", value));
+    KORVEX_ASSERT_AS(elen < sizeof _digits, "elen < sizeof(buf)");
+    return {_digits, elen};
+}
+
+Text LogFormat::Line::date(const LogFormattedDate& layout) {
+    _dateText.clear();
+    layout.fmt(_dateText, _tm, _md);
+    return {_dateText.data(), _dateText.size()};
+}
+
+// A text that was cut is not padded, whatever its minimum.
+void LogFormat::Line::fit(const Atom& atom, const Text& text) {
+    if (atom.maxw < text.size) {
+        // All bits set is no limit, even for a text of 4 GiB and more.
+        const bool unlimited = atom.maxw == static_cast<unsigned int>(-1);
+        _out.append(text.data, unlimited ? text.size : atom.maxw);
+        return;
+    }
+    const unsigned long padding = text.size < atom.minw ? atom.minw - text.size : 0;
+    if (atom.justify != 0) _out.append(padding, atom.justify);
+    _out.append(text.data, text.size);
+    if (atom.justify == 0) _out.append(padding, ' ');
+}
+
+LogFormat::LogFormat(const char* pattern) : _fmt(pattern) {
+    Compiler(*this).compile();
+}
+
+LogFormat::~LogFormat() = default;
+
+LogFormat::Atom* LogFormat::new_atom() {
+    _atoms.emplace_back();
+    return &_atoms.back();
+}
+
+void LogFormat::apply(std::string& out, const LogMsgMetadata& md, const std::string& msg) const {
+    Line line(out, md, msg);
+    for (const Atom& atom : _atoms)
+        line.append(atom);
+}
+
+}  // namespace korvex

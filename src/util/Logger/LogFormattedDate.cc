@@ -1,0 +1,139 @@
+#include <korvex/util/Logger/LogFormattedDate.h>
+
+#include <korvex/util/Logger/LogMsgMetadata.h>
+
+#include <cstdio>
+#include <limits>
+#include <memory>
+#include <stdexcept>
+#include <string_view>
+
+inline namespace korvex {
+
+namespace {
+
+constexpr std::string_view kIso8601 = "%Y-%m-%d %H:%M:%S,%l";
+
+// What a pattern without widths may produce at the very most, long locale texts and all: the
+// bound beyond which an empty result is no longer taken for a buffer too small.
+constexpr unsigned long kAmpleOutput = 4UL << 20;
+
+std::string_view choosePattern(const char* name, unsigned long len) {
+    if (name == nullptr || len == 0) return kIso8601;
+    const std::string_view text(name, len);
+    if (text == "DATE") return "%d %b %Y %H:%M:%S,%l";
+    if (text == "ISO8601") return kIso8601;
+    if (text == "ABSOLUTE") return "%H:%M:%S,%l";
+    return text;
+}
+
+bool isDigit(char c) {
+    return c >= '0' && c <= '9';
+}
+
+bool isOneOf(char c, std::string_view set) {
+    return set.find(c) != std::string_view::npos;
+}
+
+// Whether the piece is made of nothing but %p conversions, which some locales leave empty, or is
+// itself empty. It ends at its first NUL, as strftime reads it.
+bool isAllAmPm(const char* p) {
+    while (*p != '\0') {
+        if (*p++ != '%') return false;
+        if (*p != '\0' && isOneOf(*p, "_-^#")) ++p;
+        while (isDigit(*p))
+            ++p;
+        if (*p == 'E' || *p == 'O') ++p;
+        if (*p++ != 'p') return false;
+    }
+    return true;
+}
+
+// Longer than any output of the piece: ample room, and every number in it read as a width.
+unsigned long outputLimit(const std::string& piece) {
+    constexpr unsigned long most = std::numeric_limits<unsigned long>::max() / 4;
+    unsigned long limit = kAmpleOutput + piece.size() * 64;
+    unsigned long width = 0;
+    for (const char c : piece) {
+        width = isDigit(c) ? width * 10 + static_cast<unsigned long>(c - '0') : 0;
+        if (width > most || limit > most) return most;
+        limit += width;
+    }
+    return limit;
+}
+
+}  // namespace
+
+unsigned long CachedTm::ftime(char* buf, unsigned long size, const char* fmt,
+                              const LogMsgMetadata& md) {
+    if (!_stampSet) {
+        md.stamp.localtime(_stamp);
+        _stampSet = true;
+    }
+    return std::strftime(buf, size, fmt, &_stamp);
+}
+
+// The memory strftime writes to: local at first, grown by doubling, kept for the later pieces.
+class LogFormattedDate::Scratch {
+  public:
+    char* data() { return _heap ? _heap.get() : _local; }
+    unsigned long size() const { return _size; }
+    void grow() {
+        _heap.reset(new char[_size * 2]);
+        _size *= 2;
+    }
+
+  private:
+    char _local[64];
+    std::unique_ptr<char[]> _heap;
+    unsigned long _size = sizeof _local;
+};
+
+LogFormattedDate::LogFormattedDate(const char* name, unsigned long len) {
+    std::string_view rest = choosePattern(name, len);
+    while (!rest.empty()) {
+        const std::size_t msec = rest.find("%l");
+        if (msec == 0) {
+            _atoms.push_back({Atom::MSEC, {}, false, 0});
+            rest.remove_prefix(2);
+            continue;
+        }
+        std::string piece(rest.substr(0, msec));
+        rest.remove_prefix(piece.size());
+        const bool may_be_empty = isAllAmPm(piece.c_str());
+        const unsigned long limit = outputLimit(piece);
+        _atoms.push_back({Atom::STRFTIME, std::move(piece), may_be_empty, limit});
+    }
+}
+
+void LogFormattedDate::fmt(std::string& out, CachedTm& tm, const LogMsgMetadata& md) const {
+    Scratch scratch;
+    for (const Atom& atom : _atoms) {
+        if (atom.what == Atom::MSEC) {
+            char digits[64];
+            std::snprintf(digits, sizeof digits, "%03u", static_cast<unsigned>(md.stamp.msec()));
+            out.append(digits, 3);
+        } else {
+            appendStrftime(out, scratch, atom, tm, md);
+        }
+    }
+}
+
+void LogFormattedDate::appendStrftime(std::string& out, Scratch& scratch, const Atom& atom,
+                                      CachedTm& tm, const LogMsgMetadata& md) const {
+    for (;;) {
+        const unsigned long n =
+            tm.ftime(scratch.data(), scratch.size(), atom.strft_fmt.c_str(), md);
+        if (n == 0 && atom.may_be_empty) return;
+        if (n != 0 && n < scratch.size()) {
+            out.append(scratch.data(), n);
+            return;
+        }
+        if (scratch.size() > atom.limit) {
+            throw std::length_error("date layout yields nothing: " + atom.strft_fmt);
+        }
+        scratch.grow();
+    }
+}
+
+}  // namespace korvex

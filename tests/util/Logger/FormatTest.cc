@@ -1,0 +1,102 @@
+#include <korvex/util/Logger.h>
+
+#include <gtest/gtest.h>
+
+#include <cerrno>
+#include <cstring>
+#include <string>
+
+#include "support/Faults.h"
+
+namespace {
+
+using testsupport::Call;
+using testsupport::FailNth;
+
+// The runtime's way in, so that odd formats need no literal.
+std::string formatted(int errnum, const char* fmt, ...) {
+    std::string out = "former content";
+    va_list ap;
+    va_start(ap, fmt);
+    Logger::vformat(out, errnum, fmt, ap);
+    va_end(ap);
+    return out;
+}
+
+TEST(FormatTest, PercentMIsTheTextOfTheErrorNumber) {
+    EXPECT_EQ(formatted(ENOENT, "open: %m"), "open: No such file or directory");
+    EXPECT_EQ(formatted(EACCES, "%m, %m!"), "Permission denied, Permission denied!");
+    EXPECT_EQ(formatted(EACCES, "%s%m%d", "a", 7), "aPermission denied7");
+}
+
+TEST(FormatTest, ADoubledPercentSignBeforeMIsNoConversion) {
+    EXPECT_EQ(formatted(2, "100%%m"), "100%m");
+    EXPECT_EQ(formatted(2, "%%%m"), "%No such file or directory");
+    EXPECT_EQ(formatted(2, "%%%%m %m"), "%%m No such file or directory");
+}
+
+TEST(FormatTest, AnErrorNumberWithoutATextIsUnknown) {
+    EXPECT_EQ(formatted(99999, "%m"), "UNKNOWN ERROR");
+    EXPECT_EQ(formatted(-1, "%m"), "UNKNOWN ERROR");
+}
+
+TEST(FormatTest, AFailingErrorTextIsUnknown) {
+    const FailNth fault(Call::strerror_r, 1, ERANGE);
+    EXPECT_EQ(formatted(ENOENT, "%m"), "UNKNOWN ERROR");
+    EXPECT_TRUE(fault.fired());
+}
+
+TEST(FormatTest, AnErrorTextWithAWidthIsTheSameErrors) {
+    errno = EACCES;
+    EXPECT_EQ(formatted(ENOENT, "%-30m|"), "No such file or directory     |");
+}
+
+TEST(FormatTest, TheFormerContentIsReplaced) {
+    EXPECT_EQ(formatted(0, "x"), "x");
+}
+
+TEST(FormatTest, TheShortFormTakesTheCurrentErrno) {
+    std::string out;
+    errno = ENOENT;
+    __extension__ Logger::format(out, "%m");
+    EXPECT_EQ(out, "No such file or directory");
+}
+
+TEST(FormatTest, TheFormWithANumberTakesThatNumber) {
+    std::string out;
+    errno = ENOENT;
+    __extension__ Logger::format(out, EACCES, "%d %m", 5);
+    EXPECT_EQ(out, "5 Permission denied");
+}
+
+TEST(FormatTest, ErrnoStaysAsItWas) {
+    std::string out;
+    errno = 1234;
+    __extension__ Logger::format(out, EACCES, "%m");
+    EXPECT_EQ(errno, 1234);
+}
+
+TEST(FormatTest, TheResultMayBeAnArgument) {
+    std::string out(300, 'x');
+    const std::string expected = out + out;
+    Logger::format(out, "%s%s", out.c_str(), out.c_str());
+    EXPECT_EQ(out, expected);
+}
+
+TEST(FormatTest, TextsAroundTheLocalBufferComeOutWhole) {
+    for (const std::size_t n : {255U, 256U, 257U, 5000U}) {
+        const std::string text(n, 'y');
+        EXPECT_EQ(formatted(0, "%s", text.c_str()), text);
+    }
+}
+
+TEST(FormatTest, AConversionThatCannotSucceedShowsTheFormat) {
+    const wchar_t unconvertible[] = {static_cast<wchar_t>(0x7fffffff), 0};
+    EXPECT_EQ(formatted(0, "user %ls", unconvertible), "user %ls");
+}
+
+TEST(FormatTest, NulCharactersAreKept) {
+    EXPECT_EQ(formatted(0, "a%cb", 0), std::string("a\0b", 3));
+}
+
+}  // namespace
