@@ -1,0 +1,21 @@
+#pragma once
+
+#include <stdexcept>
+#include <string>
+
+inline namespace korvex {
+
+class Logger;
+
+// The exception of framework components that have become unusable; what() is the message.
+class ComponentException : public std::runtime_error {
+  public:
+    explicit ComponentException(const std::string& message);
+    // Logs the message at error level as it is built, so once, where it is thrown.
+    ComponentException(Logger& logger, const std::string& message);
+    ComponentException(const ComponentException&) = default;
+    ComponentException& operator=(const ComponentException&) = default;
+    ~ComponentException() override;
+};
+
+}  // namespace korvex

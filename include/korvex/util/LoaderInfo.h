@@ -1,0 +1,117 @@
+#pragma once
+
+#include <korvex/util/Pathname.h>
+
+#include <sys/types.h>
+#include <xmlwrapp/node.h>
+
+#include <cstdint>
+#include <ctime>
+#include <memory>
+#include <string>
+
+inline namespace korvex {
+
+// How the process was started: its directories (from the environment), its options (from the
+// command line, by popt), its id and start time. Everybody asks the one instance; the main thread
+// fills it in before other threads exist, and then it is only read. No locks.
+class LoaderInfo {
+  public:
+    // The one instance, built at the first call and never destroyed. Throws std::bad_alloc.
+    static LoaderInfo* getInstance();
+
+    // Everything empty, false or 0.
+    LoaderInfo();
+    // Copies neither getKorvexDb() nor getStartupMode(), which stay as they are (empty in a new
+    // copy), nor anything of the command line's parsing.
+    LoaderInfo(const LoaderInfo& other);
+    LoaderInfo& operator=(const LoaderInfo& other);
+    ~LoaderInfo();
+
+    // Compares all but the node and the parsing; so a copy differs from a record that has a
+    // database directory or a start-up mode.
+    bool operator==(const LoaderInfo& other) const;
+
+    // Sets the defaults ("korvexd", "etc", "myinstall", port 8089, debug and daemon true, debug
+    // log false), the process id and the start time, and prepares the parsing of the command line,
+    // which is copied. Leaves the two directories, the host and the start-up mode alone. May be
+    // called again. Throws std::bad_alloc.
+    void init(int argc, const char* const* argv);
+    // KORVEX_HOME and KORVEX_DB, where set, without doubled and trailing separators; a value that
+    // was untidy is written back to the environment.
+    void populateFromEnvironment();
+    // Parses the command line prepared by init():
+    //
+    //     --noseg      getDebug() is true; without it, false
+    //     --nodaemon   getDaemon() is false; without it, true
+    //     --debug      getUseDebugLog() is true; without it, false
+    //     -c PATH, -h HOST, -i INSTALL, -n COMPONENT, -p PORT, --mode MODE
+    //
+    // An unknown option is told on standard error and sets isError(); popt's other complaints are
+    // passed over. --help and --usage print popt's help and end the process with status 0.
+    // Nothing before init().
+    void populateFromCommandLine();
+    // Writes popt's help to standard error. Nothing before init().
+    void printHelp();
+
+    // Whether the record can be used: 0, or the negative code of the first failure. Looks at the
+    // file system, changes nothing.
+    int validate() const;
+    // The message of a code of validate(); "" for any other. The text lives for ever.
+    static const char* getErrorMessage(int code);
+    // Whether an unknown option was met since init().
+    bool isError() const { return _optionsError; }
+
+    Pathname getKorvexHome() const { return _korvexHome; }           // installation home
+    Pathname getKorvexDb() const { return _korvexDb; }               // database directory
+    std::string getComponentName() const { return _componentName; }  // the component to run as
+    std::string getInstallName() const { return _installName; }      // configuration subdirectory
+    std::string getStartupMode() const { return _startupMode; }      // free text
+    std::string getHost() const { return _host; }                    // override; usually empty
+    std::int32_t getPort() const { return _rpcPort; }                // management port
+    pid_t getPid() const { return _pid; }
+    time_t getStartupTime() const { return _startupTime; }  // seconds since the epoch
+    bool getDebug() const { return _isDebug; }              // do not dump core on failure
+    bool getDaemon() const { return _isDaemon; }            // run as a daemon
+    bool getUseDebugLog() const { return _useDebugLog; }  // start with the debug log configuration
+
+    // The component's configuration node; the reference is to the record's own.
+    const xml::node& getCommonComponentNode() const { return _commonComponentNode; }
+    xml::node& getCommonComponentNode() { return _commonComponentNode; }
+    // Stores a copy.
+    void setCommonComponentNode(const xml::node& node);
+
+    // The configuration directory (home and "etc"), and that of this installation below it.
+    Pathname getCommonConfigPath() const;
+    Pathname getInstallConfigPath() const;
+
+    // The first call of a command-line tool's main: init(), populateFromEnvironment(), and logging
+    // by etc/log-cmdline.cfg below the home, whose path it prints on standard output. Without a
+    // home it says so there and ends the process with status 255. Neither parses the command line
+    // nor validates. `envp` is not used.
+    static void common_main_setup(int argc, const char* const* argv, const char* const* envp);
+
+  private:
+    class CommandLine;
+
+    static LoaderInfo* _instance;
+
+    Pathname _korvexHome;
+    Pathname _korvexDb;
+    std::string _componentName;
+    Pathname _commonConfigPath;
+    std::string _installName;
+    std::int32_t _rpcPort = 0;
+    pid_t _pid = 0;
+    time_t _startupTime = 0;
+    std::string _host;
+    xml::node _commonComponentNode;
+    bool _isDebug = false;
+    bool _useDebugLog = false;
+    bool _isDaemon = false;
+    std::string _startupMode;
+    std::unique_ptr<CommandLine> _commandLine;  // null before init()
+    bool _optionsError = false;
+};
+
+}  // namespace korvex

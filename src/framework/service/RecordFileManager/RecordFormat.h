@@ -1,0 +1,32 @@
+#pragma once
+
+#include <cstdint>
+#include <string_view>
+
+inline namespace korvex {
+
+// file   := record*            the first one written is the version record
+// record := keyLength:u32le key valueLength:u32le value
+
+inline constexpr std::string_view VERSION_KEY = "_record-file-version";
+inline constexpr std::string_view VERSION_STR = "2.0";
+
+constexpr unsigned kLengthBytes = 4;
+
+// Lengths are little-endian on every host.
+inline void putLength(unsigned char (&out)[kLengthBytes], std::uint32_t n) {
+    for (unsigned i = 0; i < kLengthBytes; ++i)
+        out[i] = static_cast<unsigned char>(n >> (8 * i));
+}
+
+inline std::uint32_t getLength(const unsigned char (&in)[kLengthBytes]) {
+    std::uint32_t n = 0;
+    for (unsigned i = 0; i < kLengthBytes; ++i)
+        n |= static_cast<std::uint32_t>(in[i]) << (8 * i);
+    return n;
+}
+
+// Whether a key that is read back is taken for the version: by its beginning, in any case.
+bool isVersionKey(std::string_view key);
+
+}  // namespace korvex

@@ -1,0 +1,74 @@
+#include <korvex/framework/service/ComponentException.h>
+#include <korvex/framework/service/RecordFileManager.h>
+
+#include "framework/service/RecordFileManager/RecordFormat.h"
+#include "framework/service/RecordFileManager/StoreLogger.h"
+
+#include <sys/stat.h>
+
+#include <cerrno>
+#include <limits>
+
+inline namespace korvex {
+
+namespace {
+
+bool writeBytes(std::FILE* file, const void* p, std::size_t n) {
+    return n == 0 || std::fwrite(p, 1, n, file) == n;
+}
+
+bool writeField(std::FILE* file, const void* p, std::uint32_t n) {
+    unsigned char length[kLengthBytes];
+    putLength(length, n);
+    return writeBytes(file, length, sizeof length) && writeBytes(file, p, n);
+}
+
+void reportFailedWrite() {
+    __extension__ storeLogger().error(
+        "Failed to write record, giving up on saving file.  Error is %d: %m.", errno);
+}
+
+}  // namespace
+
+bool RecordFileManager::writeRecord(std::FILE* outFile, std::string key, unsigned int dataLen,
+                                    const void* data) {
+    if (outFile == nullptr) {
+        storeLogger().error("Invalid outFile passed to writeRecord.  Cannot write.");
+        return false;
+    }
+    if (key.size() > std::numeric_limits<std::uint32_t>::max()) {
+        errno = EFBIG;  // the file's lengths have 32 bits
+        return false;
+    }
+    return writeField(outFile, key.data(), static_cast<std::uint32_t>(key.size())) &&
+           writeField(outFile, data, dataLen);
+}
+
+void RecordFileManager::saveToFile() {
+    storeLogger().debug("Writing record file to disk.");
+    if (dbHomePath.empty()) {
+        throw ComponentException(storeLogger(), "Tried to write to db without setting filename.");
+    }
+    umask(066);  // the records are nobody else's business; never set back
+    std::FILE* const file = dbHomePath.fopen("wb");
+    if (file == nullptr) {
+        __extension__ storeLogger().error(
+            "Unable to open record file for writing at '%s'.  Cannot save hash data.  Error is "
+            "%d: %m.",
+            dbHomePath.c_str(), errno);
+        return;
+    }
+    writeRecord(file, std::string(VERSION_KEY), static_cast<unsigned>(VERSION_STR.size()),
+                VERSION_STR.data());
+    for (const auto& [key, value] : records) {
+        if (writeRecord(file, key, value.first, value.second)) continue;
+        reportFailedWrite();
+        std::clearerr(file);
+        std::fclose(file);
+        return;
+    }
+    // A full disk shows here at the latest.
+    if (std::fclose(file) != 0) reportFailedWrite();
+}
+
+}  // namespace korvex
