@@ -1,0 +1,28 @@
+#include "Output.h"
+
+#include <unistd.h>
+
+#include <cerrno>
+#include <cstdio>
+
+#include "Status.h"
+
+namespace {
+
+[[noreturn]] void lost() {
+    throw Failure(IO_ERROR, withErrno("standard output"));
+}
+
+}  // namespace
+
+void write(std::string_view bytes) {
+    if (std::fwrite(bytes.data(), 1, bytes.size(), stdout) != bytes.size()) lost();
+}
+
+// Some file systems tell a full disk only when the file is closed.
+void finishOutput() {
+    if (std::fflush(stdout) != 0) lost();
+    const int fd = dup(STDOUT_FILENO);
+    if (fd < 0 && errno == EBADF) return;  // closed from the start, and nothing was written
+    if (fd < 0 || close(fd) != 0) lost();
+}

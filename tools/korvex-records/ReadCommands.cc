@@ -1,0 +1,87 @@
+#include <cstdio>
+
+#include "Commands.h"
+#include "DumpFormat.h"
+#include "Escape.h"
+#include "Output.h"
+#include "RecordStore.h"
+
+namespace {
+
+std::string prefixOf(const std::vector<std::string>& arguments) {
+    return arguments.empty() ? "" : arguments.front();
+}
+
+// What was asked for, unless the file it comes from is damaged: that must not go unsaid.
+Status unlessDamaged(const RecordStore& store, Status status) {
+    const Scan& scanned = store.scanned();
+    if (scanned.whole()) return status;
+    complain(store.file() + ": damaged at offset " + std::to_string(scanned.offset) + ": " +
+             scanned.fault);
+    return DAMAGED;
+}
+
+std::string listed(const RecordStore::Record& record, const Options& options) {
+    std::string line;
+    if (options.longList) {
+        char size[16];
+        std::snprintf(size, sizeof size, "%10zu  ", record.value.size());
+        line = size;
+    }
+    if (options.nulSeparated) return line + record.key + '\0';
+    return line + escaped(record.key) + '\n';
+}
+
+}  // namespace
+
+Status runList(const Options& options, const std::vector<std::string>& arguments) {
+    const RecordStore store(options);
+    const auto records = store.enumerate(prefixOf(arguments));
+    for (const auto& record : records)
+        write(listed(record, options));
+    return unlessDamaged(store, records.empty() ? NOT_FOUND : DONE);
+}
+
+Status runGet(const Options& options, const std::vector<std::string>& arguments) {
+    const RecordStore store(options);
+    std::string value;
+    const bool found = store.get(arguments.front(), value);
+    if (!found) complain(escaped(arguments.front()) + ": no such key");
+    if (found) write(options.hex ? toHex(value) + "\n" : value);
+    return unlessDamaged(store, found ? DONE : NOT_FOUND);
+}
+
+Status runDump(const Options& options, const std::vector<std::string>& arguments) {
+    const RecordStore store(options);
+    const auto records = store.enumerate(prefixOf(arguments));
+    write(dumpHeader(options.print));
+    for (const auto& record : records) {
+        write(dumpLine(record.key, options.print));
+        write(dumpLine(record.value, options.print));
+    }
+    write(dumpTrailer());
+    return unlessDamaged(store, records.empty() ? NOT_FOUND : DONE);
+}
+
+// Takes no lock and restores no copy: it changes nothing at all.
+Status runCheck(const Options& options, const std::vector<std::string>&) {
+    const Pathname file = recordFilePath(options);
+    const Scan scanned = scan(file);
+    if (scanned.missing) throw Failure(IO_ERROR, file + ": no such file");
+    if (Pathname(file + ".copy").exists()) {
+        complain(file +
+                 ".copy is there: a run was cut off while it saved; the next one restores it");
+    }
+    const std::string count = std::to_string(scanned.records) + " records";
+    if (!scanned.whole()) {
+        write(file + ": damaged at offset " + std::to_string(scanned.offset) + " after " + count +
+              ": " + scanned.fault + "\n");
+        return DAMAGED;
+    }
+    const std::string version = scanned.version.empty()
+                                    ? std::string("no version")
+                                    : "version \"" + escaped(scanned.version) + "\"";
+    write(file + ": whole, " + version + ", " + count + ", " + std::to_string(scanned.bytes) +
+          " bytes\n");
+    return DONE;
+}
