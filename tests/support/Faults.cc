@@ -223,6 +223,13 @@ FORWARD_NUMBER(Call::pthread_attr_setstacksize, pthread_attr_setstacksize,
 FORWARD_NUMBER(Call::pthread_mutex_init, pthread_mutex_init,
                (pthread_mutex_t * mutex, const pthread_mutexattr_t* attr), (mutex, attr))
 FORWARD_NUMBER(Call::pthread_mutex_lock, pthread_mutex_lock, (pthread_mutex_t * mutex), (mutex))
+FORWARD_NUMBER(Call::pthread_mutex_unlock, pthread_mutex_unlock, (pthread_mutex_t * mutex), (mutex))
+FORWARD_NUMBER(Call::pthread_mutex_trylock, pthread_mutex_trylock, (pthread_mutex_t * mutex),
+               (mutex))
+FORWARD_NUMBER(Call::pthread_mutex_destroy, pthread_mutex_destroy, (pthread_mutex_t * mutex),
+               (mutex))
+FORWARD_NUMBER(Call::pthread_join, pthread_join, (pthread_t thread, void** result),
+               (thread, result))
 FORWARD_NUMBER(Call::pthread_cond_init, pthread_cond_init,
                (pthread_cond_t * cond, const pthread_condattr_t* attr), (cond, attr))
 FORWARD_NUMBER(Call::pthread_cond_wait, pthread_cond_wait,
