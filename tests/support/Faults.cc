@@ -207,7 +207,7 @@ FORWARD(-1, int, fsync, (int fd), (fd))
 FORWARD(-1, int, rename, (const char* from, const char* to), (from, to))
 FORWARD(-1, int, unlink, (const char* path), (path))
 FORWARD(nullptr, FILE*, fopen, (const char* path, const char* mode), (path, mode))
-FORWARD(nullptr, void*, malloc, (size_t n), (n))
+FORWARD(nullptr, void*, calloc, (size_t n, size_t size), (n, size))
 FORWARD(-1, int, gettimeofday, (struct timeval * tv, void* zone), (tv, zone))
 FORWARD(nullptr, struct tm*, localtime_r, (const time_t* t, struct tm* out), (t, out))
 FORWARD(0, size_t, strftime, (char* buf, size_t n, const char* fmt, const struct tm* tm),

@@ -22,7 +22,7 @@ enum class Call {
     fread,
     fwrite,
     fclose,
-    malloc,
+    calloc,
     gettimeofday,
     localtime_r,
     strftime,

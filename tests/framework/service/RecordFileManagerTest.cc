@@ -1,0 +1,621 @@
+#include <korvex/framework/service/ComponentException.h>
+#include <korvex/framework/service/RecordFileManager.h>
+#include <korvex/util/LoaderInfo.h>
+#include <korvex/util/Logger.h>
+
+#include <gmock/gmock.h>
+#include <sys/resource.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include <cerrno>
+#include <cstdlib>
+#include <functional>
+#include <memory>
+#include <string>
+#include <thread>
+#include <vector>
+
+#include "support/Child.h"
+#include "support/Faults.h"
+#include "support/TempDir.h"
+
+// There is one store a process, so each test has its own in a child; its messages are on the
+// child's standard error, as bare texts.
+
+namespace {
+
+using testing::ElementsAre;
+using testsupport::Call;
+using testsupport::ChildResult;
+using testsupport::CountCalls;
+using testsupport::FailNth;
+using testsupport::readFile;
+using testsupport::runInChild;
+using testsupport::TempDir;
+using testsupport::writeFile;
+
+const char kNoVersion[] =
+    "No version string found in hash db.  File has been modified or was never migrated.";
+const std::string kShort = "Short read, record file may be corrupt.\n";
+const std::string kShortKeyLength = "Short read for key length, record file may be corrupt.\n";
+const std::string kShortValueLength = "Short read for value length, record file may be corrupt.\n";
+
+std::string u32(std::size_t n) {
+    std::string bytes;
+    for (int i = 0; i < 4; ++i)
+        bytes += static_cast<char>((n >> (8 * i)) & 255);
+    return bytes;
+}
+std::string field(const std::string& s) {
+    return u32(s.size()) + s;
+}
+std::string record(const std::string& key, const std::string& value) {
+    return field(key) + field(value);
+}
+const std::string kVersionRecord(
+    "\x14\0\0\0_record-file-version\x03\0\0\0"
+    "2.0",
+    31);
+
+RecordFileManager& store() {
+    return *RecordFileManager::instance();
+}
+
+void put(const std::string& key, const std::string& value, bool save = false) {
+    PersistentHashData data;
+    data._pData = const_cast<char*>(value.data());
+    data._size = static_cast<std::uint32_t>(value.size());
+    store().put(key, data, save);
+}
+
+std::string get(const std::string& key) {
+    PersistentHashData data;
+    store().get(key, data);
+    if (data._pData == nullptr) return "(absent)";
+    const std::unique_ptr<char[]> owner(static_cast<char*>(data._pData));
+    return {owner.get(), data._size};
+}
+
+// "key=value" of every record with the prefix.
+std::vector<std::string> all(const std::string& prefix = "") {
+    std::vector<PersistentFullData> list;
+    const bool matched = store().enumerate(prefix, list);
+    std::vector<std::string> texts;
+    for (const PersistentFullData& full : list) {
+        const std::unique_ptr<char[]> key(static_cast<char*>(full._pKey));
+        const std::unique_ptr<char[]> value(static_cast<char*>(full._pData));
+        if (key[full._keySize] != '\0') texts.emplace_back("(no NUL)");
+        texts.push_back(std::string(key.get(), full._keySize) + "=" +
+                        std::string(value.get(), full._dataSize));
+    }
+    if (matched == texts.empty()) texts.emplace_back("(wrong result)");
+    return texts;
+}
+
+std::string joined(const std::vector<std::string>& texts) {
+    std::string line;
+    for (const std::string& text : texts)
+        line += text + ";";
+    return line;
+}
+
+// A ComponentException's message; "" when nothing was thrown.
+std::string thrownBy(const std::function<void()>& body) {
+    try {
+        body();
+    } catch (const ComponentException& e) {
+        return e.what();
+    }
+    return "";
+}
+
+class RecordFileManagerTest : public testing::Test {
+  protected:
+    RecordFileManagerTest() : _file(_dir.file("data")) {}
+
+    // Runs body in a process with a store of its own; what it writes to standard error. What it
+    // prints is in _out.
+    std::string run(const std::function<void()>& body) {
+        const ChildResult result = runInChild([&] {
+            store().setDBFile(Pathname(_file));
+            body();
+            return 0;
+        });
+        EXPECT_EQ(result.status, 0) << "signal " << result.signal << ": " << result.err;
+        _out = result.out;
+        return result.err;
+    }
+    // What a fresh process logs when it loads the file; the records (and what was thrown) in _out.
+    std::string load(const std::string& content) {
+        writeFile(_file, content);
+        return run([] {
+            const std::string thrown = thrownBy([] { store().readFile(); });
+            fputs(joined(all()).c_str(), stdout);
+            fputs(thrown.c_str(), stdout);
+        });
+    }
+
+    TempDir _dir;
+    const std::string _file;
+    std::string _out;
+};
+
+TEST_F(RecordFileManagerTest, AnEmptyStoreIsTheVersionRecordAlone) {
+    EXPECT_EQ(run([] { store().saveToFile(); }), "");
+    EXPECT_EQ(readFile(_file), kVersionRecord);
+}
+
+TEST_F(RecordFileManagerTest, RecordsAreSavedInByteWiseKeyOrder) {
+    run([] {
+        put("b", "2");
+        put("a", "1");
+        put("\xff", "4");
+        put("ab", "");
+        put("B", std::string("\0\n", 2));
+        put("", "empty key", true);
+    });
+    EXPECT_EQ(readFile(_file), kVersionRecord + record("", "empty key") +
+                                   record("B", std::string("\0\n", 2)) + record("a", "1") +
+                                   record("ab", "") + record("b", "2") + record("\xff", "4"));
+}
+
+TEST_F(RecordFileManagerTest, WhatWasSavedIsReadBack) {
+    std::string big;
+    for (int i = 0; i < 2500; ++i)
+        big += static_cast<char>(i);
+    run([&] {
+        put("big", big);
+        put("empty", "");
+        put("", "no key", true);
+    });
+    EXPECT_EQ(run([&] {
+                  store().readFile();
+                  if (get("big") == big && get("empty").empty() && get("") == "no key")
+                      fputs("ok", stdout);
+              }),
+              "");
+    EXPECT_EQ(_out, "ok");
+}
+
+TEST_F(RecordFileManagerTest, SavingLogsAtDebugLevel) {
+    EXPECT_EQ(run([] {
+                  Logger::setChannelLevel("recordFileManager", "DEBUG");
+                  Logger::initialize();
+                  put("a", "1");
+                  put("a", "2", true);
+                  store().remove("a");
+              }),
+              "Writing record file to disk.\nWriting record file to disk.\n");
+}
+
+TEST_F(RecordFileManagerTest, OnlyASaveReachesTheFile) {
+    run([this] {
+        put("a", "1", true);
+        const std::string before = readFile(_file);
+        put("a", "2");
+        put("b", "3");
+        if (readFile(_file) == before && get("a") == "2") fputs("ok", stdout);
+    });
+    EXPECT_EQ(_out, "ok");
+}
+
+TEST_F(RecordFileManagerTest, TheExactVersionKeyIsRefused) {
+    EXPECT_EQ(run([this] {
+                  put("_record-file-version", "x", true);
+                  if (all().empty() && readFile(_file).empty()) fputs("ok", stdout);
+              }),
+              "Someone attempted to add internal version key to map - refusing.\n");
+    EXPECT_EQ(_out, "ok");
+}
+
+TEST_F(RecordFileManagerTest, AnotherSpellingIsStoredButComesBackAsTheVersion) {
+    run([] {
+        put("_Record-File-Version", "x");
+        put("_record-file-versionX", "y");
+        put("_record-file-versio", "z", true);
+        fputs(joined(all()).c_str(), stdout);
+    });
+    EXPECT_EQ(_out, "_Record-File-Version=x;_record-file-versio=z;_record-file-versionX=y;");
+    EXPECT_EQ(run([] {
+                  store().readFile();
+                  fputs(joined(all()).c_str(), stdout);
+              }),
+              "");
+    EXPECT_EQ(_out, "_record-file-versio=z;");
+}
+
+TEST_F(RecordFileManagerTest, GetHandsOutCopies) {
+    EXPECT_EQ(run([] {
+                  put("a", "abc");
+                  PersistentHashData data;
+                  store().get("a", data);
+                  static_cast<char*>(data._pData)[0] = 'X';
+                  delete[] static_cast<char*>(data._pData);
+                  PersistentHashData absent;
+                  absent._pData = &absent;
+                  absent._size = 77;
+                  store().get("b", absent);
+                  if (get("a") == "abc" && absent._pData == nullptr && absent._size == 77)
+                      fputs("ok", stdout);
+              }),
+              "");
+    EXPECT_EQ(_out, "ok");
+}
+
+TEST_F(RecordFileManagerTest, AValueOfSizeZeroIsNotNull) {
+    run([] {
+        PersistentHashData none;
+        store().put("a", none, false);
+        PersistentHashData data;
+        store().get("a", data);
+        if (data._pData != nullptr && data._size == 0) fputs("ok", stdout);
+        delete[] static_cast<char*>(data._pData);
+    });
+    EXPECT_EQ(_out, "ok");
+}
+
+TEST_F(RecordFileManagerTest, AValueMayBePutFromTheStoresOwnCopy) {
+    run([] {
+        put("a", "abc");
+        PersistentHashData data;
+        store().get("a", data);
+        store().put("a", data, false);
+        fputs(get("a").c_str(), stdout);
+        delete[] static_cast<char*>(data._pData);
+    });
+    EXPECT_EQ(_out, "abc");
+}
+
+TEST_F(RecordFileManagerTest, RemoveSavesOnlyWhenTheKeyWasThere) {
+    run([this] {
+        put("a", "1");
+        put("b", "2");
+        const bool absent = store().remove("c");
+        const bool untouched = readFile(_file).empty();
+        const bool removed = store().remove("a");
+        if (!absent && untouched && removed && get("a") == "(absent)") fputs("ok", stdout);
+    });
+    EXPECT_EQ(_out, "ok");
+    EXPECT_EQ(readFile(_file), kVersionRecord + record("b", "2"));
+}
+
+TEST_F(RecordFileManagerTest, EnumerateMatchesThePrefixAndAppends) {
+    run([] {
+        for (const char* key : {"abc", "ab", "a", "AB", "b", "abd\xff"})
+            put(key, "1");
+        fputs((joined(all("ab")) + " " + joined(all()) + " " + joined(all("ac"))).c_str(), stdout);
+        std::vector<PersistentFullData> list(1);
+        store().enumerate("b", list);
+        if (list.size() == 2 && list[0]._pData == nullptr) fputs(" appended", stdout);
+        delete[] static_cast<char*>(list[1]._pData);
+        delete[] static_cast<char*>(list[1]._pKey);
+    });
+    EXPECT_EQ(_out, "ab=1;abc=1;abd\xff=1; AB=1;a=1;ab=1;abc=1;abd\xff=1;b=1;  appended");
+}
+
+TEST_F(RecordFileManagerTest, InitFindsTheFileBelowTheDatabaseDirectory) {
+    ASSERT_EQ(mkdir(_dir.file("hashDb").c_str(), 0700), 0);
+    writeFile(_dir.file("hashDb/data"), kVersionRecord + record("a", "1"));
+    const ChildResult result = runInChild([&] {
+        setenv("KORVEX_DB", _dir.path().c_str(), 1);
+        LoaderInfo::getInstance()->populateFromEnvironment();
+        store().init(xml::node());
+        put("b", "2", true);
+        return get("a") == "1" ? 0 : 1;
+    });
+    EXPECT_EQ(result.status, 0);
+    EXPECT_EQ(readFile(_dir.file("hashDb/data")),
+              kVersionRecord + record("a", "1") + record("b", "2"));
+}
+
+TEST_F(RecordFileManagerTest, AMissingFileIsSilentlyEmptyAndKeepsWhatIsThere) {
+    EXPECT_EQ(run([] {
+                  put("a", "1");
+                  store().readFile();
+                  fputs(joined(all()).c_str(), stdout);
+              }),
+              "");
+    EXPECT_EQ(_out, "a=1;");
+}
+
+TEST_F(RecordFileManagerTest, AnEmptyFileLoadsQuietly) {
+    EXPECT_EQ(load(""), "");
+    EXPECT_EQ(_out, "");
+}
+
+TEST_F(RecordFileManagerTest, AWholeFileWithoutAVersionLoadsQuietly) {
+    EXPECT_EQ(load(record("a", "1") + record("b", "2")), "");
+    EXPECT_EQ(_out, "a=1;b=2;");
+}
+
+TEST_F(RecordFileManagerTest, VersionRecordsAreToldByTheirBeginningInAnyCase) {
+    EXPECT_EQ(load(record("_RECORD-FILE-VERSION", "1") + record("_record-file-versionX", "2") +
+                   record("_record-file-versio", "3")),
+              "");
+    EXPECT_EQ(_out, "_record-file-versio=3;");
+}
+
+TEST_F(RecordFileManagerTest, AnyVersionIsAccepted) {
+    EXPECT_EQ(load(record("_record-file-version", "99") + record("a", "abc").substr(0, 11)),
+              kShort);
+    EXPECT_EQ(_out, std::string("a=ab").c_str()) << "printed up to the NUL";
+}
+
+TEST_F(RecordFileManagerTest, AnEmptyVersionIsNone) {
+    EXPECT_EQ(load(record("_record-file-version", "") + record("a", "abc").substr(0, 11)),
+              kShort + kNoVersion + "\n");
+    EXPECT_EQ(load(record("_record-file-version", std::string("\0x", 2)) +
+                   record("a", "abc").substr(0, 11)),
+              kShort + kNoVersion + "\n")
+        << "it ends at its first NUL";
+}
+
+TEST_F(RecordFileManagerTest, AKeyEndsAtItsFirstNul) {
+    EXPECT_EQ(load(kVersionRecord + record(std::string("a\0b", 3), "1")), "");
+    EXPECT_EQ(_out, "a=1;");
+}
+
+TEST_F(RecordFileManagerTest, OfTwoRecordsWithOneKeyTheLaterOneStays) {
+    EXPECT_EQ(load(record("b", "1") + record("a", "2") + record("b", "3")), "");
+    EXPECT_EQ(_out, "a=2;b=3;");
+}
+
+TEST_F(RecordFileManagerTest, ACutKeyLengthIsReportedAndWhatWasReadStays) {
+    for (std::size_t n = 1; n < 4; ++n) {
+        EXPECT_EQ(load(record("a", "1") + u32(5).substr(0, n)), kShortKeyLength) << n;
+        EXPECT_EQ(_out, "a=1;");
+    }
+}
+
+TEST_F(RecordFileManagerTest, ACutKeyIsReportedTwice) {
+    EXPECT_EQ(load(record("a", "1") + u32(5) + "abc"), kShort + kShortValueLength);
+    EXPECT_EQ(_out, "a=1;");
+    EXPECT_EQ(load(record("a", "1") + u32(5)), kShort + kShortValueLength);
+}
+
+TEST_F(RecordFileManagerTest, ACutValueLengthIsReported) {
+    for (std::size_t n = 0; n < 4; ++n) {
+        EXPECT_EQ(load(record("a", "1") + field("key") + u32(5).substr(0, n)), kShortValueLength)
+            << n;
+        EXPECT_EQ(_out, "a=1;");
+    }
+}
+
+TEST_F(RecordFileManagerTest, ACutValueIsStoredWithZeroBytesAndItsFullLength) {
+    writeFile(_file, kVersionRecord + u32(1) + "a" + u32(6) + "xyz");
+    EXPECT_EQ(run([] {
+                  store().readFile();
+                  if (get("a") == std::string("xyz\0\0\0", 6)) fputs("ok", stdout);
+              }),
+              kShort);
+    EXPECT_EQ(_out, "ok");
+}
+
+TEST_F(RecordFileManagerTest, ACutValueInAFileWithoutAVersionThrowsAfterStoring) {
+    EXPECT_EQ(load(u32(1) + "a" + u32(3)), kShort + kNoVersion + "\n");
+    EXPECT_EQ(_out, std::string("a=") + kNoVersion) << "the zero bytes end the printed text";
+}
+
+TEST_F(RecordFileManagerTest, AShortChunkIsReportedEachTime) {
+    const auto cut = [](std::size_t claimed, std::size_t there) {
+        return kVersionRecord + u32(1) + "a" + u32(claimed) + std::string(there, 'x');
+    };
+    EXPECT_EQ(load(cut(2500, 2400)), kShort) << "in the last chunk";
+    EXPECT_EQ(load(cut(2500, 2000)), kShort) << "nothing in the last chunk";
+    EXPECT_EQ(load(cut(2500, 1500)), kShort + kShort) << "in a middle chunk, then nothing";
+    EXPECT_EQ(load(cut(1000, 999)), kShort);
+    EXPECT_EQ(load(cut(1000, 1000)), "");
+    EXPECT_EQ(load(cut(1001, 1000)), kShort);
+}
+
+TEST_F(RecordFileManagerTest, ValuesAreReadInPiecesOfAThousand) {
+    writeFile(_file, kVersionRecord + record("a", std::string(2500, 'x')));
+    run([] {
+        const CountCalls reads(Call::fread);
+        store().readFile();
+        // version: 2 lengths, key, value; record: 2 lengths, key, 3 pieces; and the end
+        if (reads.count() == 11) fputs("ok", stdout);
+    });
+    EXPECT_EQ(_out, "ok");
+}
+
+TEST_F(RecordFileManagerTest, AClaimOfFourGibibytesTouchesNoGibibytes) {
+    const std::string claims[] = {kVersionRecord + u32(1) + "a" + "\xff\xff\xff\xff" + "xyz",
+                                  kVersionRecord + "\xff\xff\xff\xff" + "xyz"};
+    for (const std::string& claim : claims) {
+        writeFile(_file, claim);
+        run([] {
+            thrownBy([] { store().readFile(); });
+            struct rusage usage {};
+            getrusage(RUSAGE_SELF, &usage);
+            if (usage.ru_maxrss < 1000000) fputs("ok", stdout);
+        });
+        EXPECT_EQ(_out, "ok");
+    }
+}
+
+TEST_F(RecordFileManagerTest, AnUnreadableFileIsReported) {
+    ASSERT_EQ(mkdir(_file.c_str(), 0700), 0);
+    EXPECT_EQ(run([] { store().readFile(); }), kShortKeyLength);
+}
+
+TEST_F(RecordFileManagerTest, AllocationFailuresThrowAndCloseTheFile) {
+    const char* const messages[] = {"Unable to allocate memory for reading hash key.",
+                                    "Unable to allocate memory for reading hash value."};
+    writeFile(_file, kVersionRecord + record("a", "1"));
+    for (unsigned long k = 1; k <= 4; ++k) {
+        const char* const message = messages[(k - 1) % 2];
+        EXPECT_EQ(run([&] {
+                      const CountCalls closes(Call::fclose);
+                      const FailNth fault(Call::calloc, k, ENOMEM);
+                      fputs(thrownBy([] { store().readFile(); }).c_str(), stdout);
+                      if (!fault.fired() || closes.count() != 1) fputs("not so", stdout);
+                  }),
+                  std::string(message) + "\n");
+        EXPECT_EQ(_out, message);
+    }
+}
+
+TEST_F(RecordFileManagerTest, PutWithoutMemoryThrowsAndChangesNothing) {
+    const std::string message = "Unable to allocate memory for storing hash value.";
+    EXPECT_EQ(run([] {
+                  put("a", "1");
+                  {
+                      const FailNth fault(Call::calloc, 1, ENOMEM);
+                      fputs(thrownBy([] { put("a", "2"); }).c_str(), stdout);
+                  }
+                  put("b", "3");  // the lock is free again
+                  fputs(joined(all()).c_str(), stdout);
+              }),
+              message + "\n");
+    EXPECT_EQ(_out, message + "a=1;b=3;");
+}
+
+TEST_F(RecordFileManagerTest, SavingWithoutAFileNameThrows) {
+    const std::string message = "Tried to write to db without setting filename.";
+    const ChildResult result = runInChild([] {
+        fputs(thrownBy([] { put("a", "1", true); }).c_str(), stdout);
+        put("b", "2");  // the lock is free again
+        fputs(joined(all()).c_str(), stdout);
+        return 0;
+    });
+    EXPECT_EQ(result.out, message + "a=1;b=2;");
+    EXPECT_EQ(result.err, message + "\n");
+}
+
+TEST_F(RecordFileManagerTest, ASaveThatCannotOpenIsReported) {
+    ASSERT_EQ(mkdir(_file.c_str(), 0700), 0);
+    EXPECT_EQ(run([] {
+                  put("a", "1", true);
+                  fputs(joined(all()).c_str(), stdout);
+              }),
+              "Unable to open record file for writing at '" + _file +
+                  "'.  Cannot save hash data.  Error is 21: Is a directory.\n");
+    EXPECT_EQ(_out, "a=1;");
+}
+
+TEST_F(RecordFileManagerTest, AFailingWriteGivesUpAndKeepsMemory) {
+    const std::string message =
+        "Failed to write record, giving up on saving file.  Error is 28: No space left on "
+        "device.\n";
+    for (unsigned long k = 5; k <= 8; ++k) {
+        EXPECT_EQ(run([&] {
+                      put("a", "1");
+                      put("b", "2");
+                      {
+                          const CountCalls closes(Call::fclose);
+                          const FailNth fault(Call::fwrite, k, ENOSPC);
+                          store().saveToFile();
+                          if (!fault.fired() || closes.count() != 1) fputs("not so", stdout);
+                      }
+                      fputs(joined(all()).c_str(), stdout);
+                      put("c", "3", true);
+                  }),
+                  message);
+        EXPECT_EQ(_out, "a=1;b=2;") << k;
+        EXPECT_EQ(readFile(_file),
+                  kVersionRecord + record("a", "1") + record("b", "2") + record("c", "3"));
+    }
+}
+
+TEST_F(RecordFileManagerTest, AFailingVersionRecordIsNotLookedAt) {
+    EXPECT_EQ(run([] {
+                  const FailNth fault(Call::fwrite, 1, ENOSPC);
+                  put("a", "1", true);
+              }),
+              "");
+    EXPECT_EQ(readFile(_file), record("a", "1"));
+}
+
+TEST_F(RecordFileManagerTest, AFullDiskThatShowsAtTheCloseIsReported) {
+    if (access("/dev/full", W_OK) != 0) GTEST_SKIP() << "/dev/full is not there";
+    EXPECT_EQ(run([] {
+                  store().setDBFile(Pathname("/dev/full"));
+                  put("a", "1", true);
+              }),
+              "Failed to write record, giving up on saving file.  Error is 28: No space left on "
+              "device.\n");
+}
+
+TEST_F(RecordFileManagerTest, TheUmaskStays066AfterASave) {
+    run([this] {
+        umask(0);
+        put("a", "1", true);
+        struct stat st {};
+        stat(_file.c_str(), &st);
+        if (umask(0) == 066 && (st.st_mode & 07777) == 0600) fputs("ok", stdout);
+    });
+    EXPECT_EQ(_out, "ok");
+}
+
+TEST_F(RecordFileManagerTest, StepsRefuseANullStream) {
+    EXPECT_EQ(run([] {
+                  char buf[4] = "abc";
+                  store().readLooped(buf, 3, nullptr);
+                  if (!store().writeRecord(nullptr, "a", 0, nullptr) && std::string(buf) == "abc") {
+                      fputs("ok", stdout);
+                  }
+              }),
+              "Invalid input file passed to readLooped, cannot read.\n"
+              "Invalid outFile passed to writeRecord.  Cannot write.\n");
+    EXPECT_EQ(_out, "ok");
+}
+
+TEST_F(RecordFileManagerTest, ReadLoopedReadsNothingForZero) {
+    writeFile(_file, "abc");
+    run([this] {
+        std::FILE* const file = fopen(_file.c_str(), "rb");
+        char c = '?';
+        store().readLooped(&c, 0, file);
+        if (c == '?' && ftell(file) == 0) fputs("ok", stdout);
+        fclose(file);
+    });
+    EXPECT_EQ(_out, "ok");
+}
+
+TEST_F(RecordFileManagerTest, PreloadMergesTheMatchingRecordsOfAnotherFile) {
+    writeFile(_dir.file("other"), record("_record-file-version", "9") + record("a1", "x") +
+                                      record("b", "y") + record("a2", "z"));
+    EXPECT_EQ(run([this] {
+                  put("a1", "old");
+                  put("c", "kept");
+                  store().preload("a", Pathname(_dir.file("other")));
+                  store().preload("a", Pathname(_dir.file("missing")));
+                  fputs(joined(all()).c_str(), stdout);
+              }),
+              "");
+    EXPECT_EQ(_out, "a1=x;a2=z;c=kept;");
+    EXPECT_EQ(readFile(_file), "") << "nothing is saved";
+}
+
+TEST_F(RecordFileManagerTest, ManyThreadsMayPut) {
+    run([] {
+        std::vector<std::thread> threads;
+        for (int t = 0; t < 4; ++t) {
+            threads.emplace_back([t] {
+                for (int i = 0; i < 250; ++i)
+                    put(std::to_string(t) + "-" + std::to_string(i), "v");
+            });
+        }
+        for (std::thread& thread : threads)
+            thread.join();
+        fputs(std::to_string(all().size()).c_str(), stdout);
+    });
+    EXPECT_EQ(_out, "1000");
+}
+
+TEST(ComponentExceptionTest, LogsOnceWhenItIsGivenALogger) {
+    const ChildResult result = runInChild([] {
+        Logger logger("x");
+        const ComponentException quiet("quiet");
+        const ComponentException loud(logger, "loud %d");
+        const ComponentException copy(loud);
+        return std::string(copy.what()) == "loud %d" && std::string(quiet.what()) == "quiet" ? 0
+                                                                                             : 1;
+    });
+    EXPECT_EQ(result.status, 0);
+    EXPECT_EQ(result.err, "loud %d\n");
+}
+
+}  // namespace
