@@ -165,7 +165,8 @@ TEST(LoaderInfoTest, HelpEndsTheProcessAndHidesNoseg) {
          {"Usage: ", "--nodaemon", "causes the system not to daemonize", "override the config path",
           "override the host name", "the name of the configuration subdir",
           "the component name to start with", "the management port for soap calls", "--debug",
-          "start with debug log config", "--mode", "the startup mode", "Help options:", "--usage"}) {
+          "start with debug log config", "--mode", "the startup mode",
+          "Help options:", "--usage"}) {
         EXPECT_THAT(result.out, HasSubstr(text));
     }
     EXPECT_THAT(result.out, Not(HasSubstr("noseg")));
@@ -297,13 +298,16 @@ TEST(ErrorMessageTest, EachCodeHasItsText) {
         "The environment variable KORVEX_HOME must point to a directory.",
         "The environment variable KORVEX_DB must point to a directory.",
         "The common config path must point to a directory.",
-        "The environment variable KORVEX_HOME must point to a directory that's writable the process.",
+        "The environment variable KORVEX_HOME must point to a directory that's writable the "
+        "process.",
         "The environment variable KORVEX_DB must point to a directory that's writable the process.",
         "The component name must not be empty.",
         "The install name must not be empty.",
         "The component name was too large for spread."};
-    for (int i = 0; i < 17; ++i) EXPECT_STREQ(LoaderInfo::getErrorMessage(-1 - i), texts[i]);
-    for (const int code : {0, 1, -18, 1000}) EXPECT_STREQ(LoaderInfo::getErrorMessage(code), "");
+    for (int i = 0; i < 17; ++i)
+        EXPECT_STREQ(LoaderInfo::getErrorMessage(-1 - i), texts[i]);
+    for (const int code : {0, 1, -18, 1000})
+        EXPECT_STREQ(LoaderInfo::getErrorMessage(code), "");
 }
 
 TEST_F(EnvironmentTest, ACopyLeavesTheDatabaseAndTheModeBehind) {
@@ -345,7 +349,7 @@ TEST_F(EnvironmentTest, EqualityLooksAtAllButTheNode) {
     b.setCommonComponentNode(xml::node("other"));
     EXPECT_TRUE(a == b);
     const std::vector<std::vector<const char*>> differences = {
-        {"-n", "x"}, {"-c", "x"}, {"-i", "x"},  {"-p", "1"}, {"-h", "x"},
+        {"-n", "x"}, {"-c", "x"}, {"-i", "x"},    {"-p", "1"},    {"-h", "x"},
         {"--noseg"}, {"--debug"}, {"--nodaemon"}, {"--mode", "x"}};
     for (const auto& arguments : differences) {
         EXPECT_FALSE(a == Parsed(arguments)) << arguments.front();
@@ -402,8 +406,9 @@ TEST(CommonMainSetupTest, TheConfigurationPathIsPrintedAndRead) {
     EXPECT_EQ(result.status, 0);
     EXPECT_EQ(result.out,
               "Using logging configuration at /nowhere/k/etc/log-cmdline.cfg.\n[/nowhere/k]\n");
-    EXPECT_EQ(result.err, "Couldn't open log file configuration "
-                          "\"/nowhere/k/etc/log-cmdline.cfg\": No such file or directory\n");
+    EXPECT_EQ(result.err,
+              "Couldn't open log file configuration "
+              "\"/nowhere/k/etc/log-cmdline.cfg\": No such file or directory\n");
 }
 
 TEST(CommonMainSetupTest, OptionsAreNotParsed) {
