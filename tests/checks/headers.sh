@@ -1,0 +1,17 @@
+#!/bin/sh
+# Checks that every public header compiles alone, without a warning, also in a program whose macros
+# have the levels' names. Usage: headers.sh SOURCE-DIR CXX
+set -eu
+cd "$1"
+flags="-std=c++17 -fsyntax-only -Wall -Wextra -Wpedantic -Wconversion -Wshadow -Werror
+    -Iinclude -Icompat/xmlwrapp/include $(pkg-config --cflags xmlwrapp 2> /dev/null || true)"
+count=0
+for header in $(find include -name '*.h' | sort); do
+    for macros in "" "-DDEBUG -DINFO=1 -DNOTICE -DWARN -DERROR=2 -DCRIT -DALERT -DFATAL -DEMERG"; do
+        # shellcheck disable=SC2086  # lists of flags
+        printf '#include <%s>\n#include <%s>\nint main() {}\n' "${header#include/}" "${header#include/}" |
+            "$2" $flags $macros -x c++ -
+    done
+    count=$((count + 1))
+done
+[ "$count" -ge 15 ]
