@@ -48,7 +48,8 @@ class KorvexRecordsTest : public testing::Test {
             if (_db.empty() ? unsetenv("KORVEX_DB") : setenv("KORVEX_DB", _db.c_str(), 1))
                 return 98;
             dup2(open(in.c_str(), O_RDONLY), 0);
-            if (!_stdout.empty()) dup2(open(_stdout.c_str(), O_WRONLY), 1);
+            if (_stdout == "closed") close(1);
+            if (!_stdout.empty() && _stdout != "closed") dup2(open(_stdout.c_str(), O_WRONLY), 1);
             if (_sizeLimit > 0) {
                 const struct rlimit limit { _sizeLimit, _sizeLimit };
                 setrlimit(RLIMIT_FSIZE, &limit);
@@ -355,6 +356,17 @@ TEST_F(KorvexRecordsTest, LostOutputIsNoticed) {
         EXPECT_EQ(statusOf({verb}), 4) << verb;
     EXPECT_EQ(statusOf({"get", "a"}), 4);
     EXPECT_EQ(statusOf({"--version"}), 4);
+}
+
+TEST_F(KorvexRecordsTest, AClosedStandardOutputIsLostOutputAndWritesNowhereElse) {
+    outOf({"put", "a", "1"});
+    const std::string before = readFile(_data);
+    _stdout = "closed";
+    EXPECT_EQ(statusOf({"get", "a"}), 4);
+    EXPECT_EQ(statusOf({"list"}), 4);
+    EXPECT_EQ(statusOf({"put", "a", "1"}), 0) << "it has nothing to print";
+    EXPECT_EQ(readFile(_data), before);
+    EXPECT_EQ(readFile(_data + ".lock"), "");
 }
 
 TEST_F(KorvexRecordsTest, ASaveThatFailsPutsTheOldFileBack) {

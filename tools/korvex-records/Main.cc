@@ -1,5 +1,6 @@
 #include <korvex/util/LoaderInfo.h>
 
+#include <fcntl.h>
 #include <unistd.h>
 
 #include <cstdio>
@@ -10,6 +11,16 @@
 
 namespace {
 
+// A closed standard descriptor would be given to the next file that is opened, and be written to.
+// Held open for reading only it makes writing fail instead.
+void occupyStandardDescriptors() {
+    int fd = 0;
+    do {
+        fd = open("/dev/null", O_RDONLY);
+    } while (fd >= 0 && fd <= STDERR_FILENO);
+    if (fd >= 0) close(fd);
+}
+
 // What the set-up prints is for people: it goes to standard error, so that standard output holds
 // just what was asked for.
 void setUp(int argc, char** argv, char** envp) {
@@ -17,12 +28,8 @@ void setUp(int argc, char** argv, char** envp) {
     dup2(STDERR_FILENO, STDOUT_FILENO);
     LoaderInfo::common_main_setup(argc, argv, envp);
     std::fflush(stdout);
-    if (out >= 0) {
-        dup2(out, STDOUT_FILENO);
-        close(out);
-    } else {
-        close(STDOUT_FILENO);
-    }
+    dup2(out, STDOUT_FILENO);
+    close(out);
 }
 
 Status run(int argc, char** argv) {
@@ -37,6 +44,7 @@ Status run(int argc, char** argv) {
 
 int main(int argc, char** argv, char** envp) {
     try {
+        occupyStandardDescriptors();
         setUp(argc, argv, envp);
         return run(argc, argv);
     } catch (const Failure& failure) {

@@ -42,8 +42,9 @@ void EarlyLoggers::remove(Logger& logger) {
     }
 }
 
-bool EarlyLoggers::isEmptyOrLacks(const Logger& logger) {
+bool EarlyLoggers::isUnusable(const Logger& logger) {
     const NologLock lock(listMutex());
+    if (logger_initialized) return false;  // it has been emptied meanwhile
     for (const Logger* l = uninitialized_loggers; l != nullptr; l = l->_next) {
         if (l == &logger) return false;
     }
@@ -64,7 +65,7 @@ void EarlyLoggers::initialize() {
 
 bool LogFormat::check_for_unitialized_logger(const Logger* logger) {
     if (logger_initialized.load(std::memory_order_acquire)) return false;
-    return EarlyLoggers::isEmptyOrLacks(*logger);
+    return EarlyLoggers::isUnusable(*logger);
 }
 
 }  // namespace korvex

@@ -17,7 +17,8 @@ class EarlyLoggers {
     static void add(Logger& logger);
     // Takes it off the list, if it is there.
     static void remove(Logger& logger);
-    static bool isEmptyOrLacks(const Logger& logger);
+    // Whether logging is not initialised and the logger not on the list: not constructed yet.
+    static bool isUnusable(const Logger& logger);
     // Marks logging as initialised and binds every logger on the list, newest first.
     static void initialize();
 
