@@ -221,7 +221,7 @@ TEST(ScopedMutexTest, HoldsAndLetsGo) {
 
 TEST(ScopedMutexTest, AFailingUnlockThrowsUnlessAnExceptionIsOnItsWay) {
     expectChecked("pthread_mutex_unlock", "Operation not permitted", [] {
-        Mutex& mutex = *new Mutex;  // it stays locked, so it is not destroyed
+        static Mutex& mutex = *new Mutex;  // it stays locked, so it is not destroyed
         const ScopedMutex lock(mutex);
         static const FailNth fault(Call::pthread_mutex_unlock, 1, EPERM);
     });
