@@ -14,6 +14,7 @@
 #include <cstdarg>
 #include <cstddef>
 #include <cstdio>
+#include <new>
 
 namespace testsupport {
 
@@ -179,6 +180,12 @@ size_t __wrap_fwrite(const void* p, size_t size, size_t n, FILE* file) {
         return 0;
     }
     return __real_fwrite(p, size, std::min<size_t>(n, verdict.limit), file);
+}
+
+void* __real__Znam(size_t n);
+void* __wrap__Znam(size_t n) {
+    if (fails(Call::new_array)) throw std::bad_alloc();
+    return __real__Znam(n);
 }
 
 int __real_close(int fd);

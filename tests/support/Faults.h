@@ -23,6 +23,7 @@ enum class Call {
     fwrite,
     fclose,
     calloc,
+    new_array,  // operator new[]; a failure throws std::bad_alloc
     gettimeofday,
     localtime_r,
     strftime,

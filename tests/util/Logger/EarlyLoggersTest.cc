@@ -15,6 +15,7 @@
 #include <vector>
 
 #include "support/Child.h"
+#include "support/Faults.h"
 
 // What loggers do before Logger::initialize, when it binds them, and beyond main. Each test runs in
 // a process of its own, because initialisation happens once.
@@ -132,6 +133,29 @@ TEST(EarlyLoggersTest, ErrnoStaysAsItWas) {
                   return errno == 1234 ? 0 : 1;
               }).status,
               0);
+}
+
+TEST(EarlyLoggersTest, AMessageThatCannotBeFormattedIsDropped) {
+    EXPECT_EQ(errOf([] {
+                  Logger logger("a");
+                  const std::string text(300, 'x');
+                  const testsupport::FailNth fault(testsupport::Call::new_array, 1, ENOMEM);
+                  logger.warn("%s", text.c_str());
+                  logger.warn("%s", "next");
+                  EXPECT_TRUE(fault.fired());
+              }),
+              "next\n");
+}
+
+TEST(EarlyLoggersTest, AFilteredMessageIsNotFormatted) {
+    EXPECT_EQ(errOf([] {
+                  Logger logger("a");
+                  const std::string text(300, 'x');
+                  const testsupport::CountCalls blocks(testsupport::Call::new_array);
+                  logger.debug("%s", text.c_str());
+                  EXPECT_EQ(blocks.count(), 0U);
+              }),
+              "");
 }
 
 TEST(EarlyLoggersTest, InitialisationBindsTheWaitingLoggersToTheirChannels) {

@@ -11,6 +11,7 @@
 namespace {
 
 using testsupport::Call;
+using testsupport::CountCalls;
 using testsupport::FailNth;
 
 // The runtime's way in, so that odd formats need no literal.
@@ -88,6 +89,16 @@ TEST(FormatTest, TextsAroundTheLocalBufferComeOutWhole) {
         const std::string text(n, 'y');
         EXPECT_EQ(formatted(0, "%s", text.c_str()), text);
     }
+}
+
+TEST(FormatTest, OnlyLongerTextsTouchTheHeap) {
+    const std::string fits(255, 'y');
+    const std::string tooLong(256, 'y');
+    const CountCalls blocks(Call::new_array);
+    formatted(0, "%s", fits.c_str());
+    EXPECT_EQ(blocks.count(), 0U);
+    formatted(0, "%s", tooLong.c_str());
+    EXPECT_EQ(blocks.count(), 1U);
 }
 
 TEST(FormatTest, AConversionThatCannotSucceedShowsTheFormat) {
