@@ -206,6 +206,13 @@ int __wrap_fclose(FILE* file) {
     return EOF;
 }
 
+int __real_pthread_join(pthread_t thread, void** result);
+int __wrap_pthread_join(pthread_t thread, void** result) {
+    const int error = judge(Call::pthread_join).error;
+    const int joined = __real_pthread_join(thread, result);
+    return error != 0 ? error : joined;
+}
+
 FORWARD(-1, ssize_t, writev, (int fd, const struct iovec* vec, int n), (fd, vec, n))
 FORWARD(-1, int, fstat, (int fd, struct stat* st), (fd, st))
 FORWARD(-1, int, stat, (const char* path, struct stat* st), (path, st))
@@ -235,8 +242,6 @@ FORWARD_NUMBER(Call::pthread_mutex_trylock, pthread_mutex_trylock, (pthread_mute
                (mutex))
 FORWARD_NUMBER(Call::pthread_mutex_destroy, pthread_mutex_destroy, (pthread_mutex_t * mutex),
                (mutex))
-FORWARD_NUMBER(Call::pthread_join, pthread_join, (pthread_t thread, void** result),
-               (thread, result))
 FORWARD_NUMBER(Call::pthread_cond_init, pthread_cond_init,
                (pthread_cond_t * cond, const pthread_condattr_t* attr), (cond, attr))
 FORWARD_NUMBER(Call::pthread_cond_wait, pthread_cond_wait,

@@ -60,7 +60,8 @@ class CountCalls {
 };
 
 // Lets the k-th call (from 1) from now on fail with `error`, in any thread: errno for the system
-// calls, the returned number for pthread calls and strerror_r. A close or fclose still closes.
+// calls, the returned number for pthread calls and strerror_r. A close or fclose still closes, a
+// join still joins.
 class FailNth : public CountCalls {
   public:
     enum Persistence { ONCE, FROM_THEN_ON };

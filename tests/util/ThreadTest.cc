@@ -222,7 +222,7 @@ TEST(ThreadTest, WithCheckingOffAThreadThatWasNeverCreatedIsJoinedQuietly) {
 TEST(ThreadTest, AFailingJoinIsChecked) {
     const ChildResult result = child([] {
         const Thread mainThread;
-        static Worker& worker = *new Worker("w");  // not joined, so it outlives the test
+        Worker worker("w");
         worker.go();
         const FailNth fault(Call::pthread_join, 1, EDEADLK);
         try {
