@@ -3,6 +3,7 @@
 
 #include <gmock/gmock.h>
 #include <sys/stat.h>
+#include <sys/sysmacros.h>
 #include <unistd.h>
 
 #include <cerrno>
@@ -380,6 +381,13 @@ TEST_F(FileSystemTest, TypesAreTold) {
     EXPECT_TRUE(path("file").isReg() && !path("file").isDir());
     EXPECT_TRUE(path("link").isReg());
     EXPECT_FALSE(path("fifo").isReg() || path("fifo").isDir());
+    // The types are numbers, not bits: a socket's holds a regular file's, a block device's a
+    // directory's (which takes privileges to make).
+    ASSERT_EQ(mknod(path("socket").c_str(), S_IFSOCK | 0600, 0), 0);
+    EXPECT_FALSE(path("socket").isReg());
+    if (mknod(path("block").c_str(), S_IFBLK | 0600, makedev(7, 0)) == 0) {
+        EXPECT_FALSE(path("block").isDir());
+    }
     EXPECT_FALSE(Pathname("/dev/null").isReg() || Pathname("/dev/null").isDir());
     errno = 0;
     EXPECT_FALSE(path("missing").exists());

@@ -6,11 +6,9 @@
 #include <memory>
 #include <string_view>
 
-namespace {
+#include "Stream.h"
 
-struct CloseStream {
-    void operator()(std::FILE* file) const { std::fclose(file); }
-};
+namespace {
 
 class Comparison {
   public:
@@ -43,7 +41,7 @@ class Comparison {
 }  // namespace
 
 bool fileHolds(const Pathname& file, const std::vector<RecordStore::Record>& records) {
-    const std::unique_ptr<std::FILE, CloseStream> stream(file.fopen("rb"));
+    const Stream stream(file.fopen("rb"));
     if (!stream) return false;
     Comparison comparison(stream.get());
     if (!comparison.record("_record-file-version", "2.0")) return false;

@@ -9,6 +9,7 @@
 
 #include "Escape.h"
 #include "Status.h"
+#include "Stream.h"
 
 namespace {
 
@@ -18,10 +19,6 @@ constexpr std::size_t kVersionKeyLength = sizeof kVersionKey - 1;
 bool looksLikeVersionKey(const std::string& key) {
     return strncasecmp(key.c_str(), kVersionKey, kVersionKeyLength) == 0;
 }
-
-struct CloseStream {
-    void operator()(std::FILE* file) const { std::fclose(file); }
-};
 
 class Scanner {
   public:
@@ -129,7 +126,7 @@ bool isRefusedKey(const std::string& key) {
 }
 
 Scan scan(const Pathname& file) {
-    const std::unique_ptr<std::FILE, CloseStream> stream(file.fopen("rb"));
+    const Stream stream(file.fopen("rb"));
     if (!stream && errno == ENOENT) {
         Scan result;
         result.missing = true;

@@ -1,6 +1,7 @@
 #include <korvex/util/Logger.h>
 
 #include "base/Assert.h"
+#include "base/Stream.h"
 #include "util/Logger/AppenderRegistry.h"
 #include "util/Logger/ConfigReader.h"
 #include "util/Logger/EarlyLoggers.h"
@@ -13,11 +14,6 @@
 inline namespace korvex {
 
 namespace {
-
-struct CloseStream {
-    void operator()(std::FILE* file) const { std::fclose(file); }
-};
-using Stream = std::unique_ptr<std::FILE, CloseStream>;
 
 void reportParseErrors(const Pathname& conffile, const DeferedLogConfList& parse_errors) {
     for (const DeferedLogConf& error : parse_errors) {

@@ -1,6 +1,7 @@
 #include <korvex/framework/service/ComponentException.h>
 #include <korvex/framework/service/RecordFileManager.h>
 
+#include "base/Stream.h"
 #include "framework/service/RecordFileManager/RecordFormat.h"
 #include "framework/service/RecordFileManager/StoreLogger.h"
 #include "framework/service/RecordFileManager/ValueBlock.h"
@@ -14,11 +15,6 @@
 inline namespace korvex {
 
 namespace {
-
-struct CloseStream {
-    void operator()(std::FILE* file) const { std::fclose(file); }
-};
-using Stream = std::unique_ptr<std::FILE, CloseStream>;
 
 const char* text(const Block& block) {
     return static_cast<const char*>(block.get());
