@@ -226,6 +226,8 @@ FORWARD(-1, int, gettimeofday, (struct timeval * tv, void* zone), (tv, zone))
 FORWARD(nullptr, struct tm*, localtime_r, (const time_t* t, struct tm* out), (t, out))
 FORWARD(0, size_t, strftime, (char* buf, size_t n, const char* fmt, const struct tm* tm),
         (buf, n, fmt, tm))
+FORWARD(-1, int, setenv, (const char* name, const char* value, int overwrite),
+        (name, value, overwrite))
 FORWARD_NUMBER(Call::strerror_r, __xpg_strerror_r, (int number, char* buf, size_t n),
                (number, buf, n))
 FORWARD_NUMBER(Call::pthread_create, pthread_create,

@@ -28,6 +28,7 @@ enum class Call {
     localtime_r,
     strftime,
     strerror_r,
+    setenv,
     pthread_create,
     pthread_attr_init,
     pthread_attr_setstacksize,

@@ -53,13 +53,11 @@ void ConfigReader::readLine(const std::string& line) {
     if (key == line.size()) return;
     const std::size_t keyEnd = findDelimiter(line, key, ".= \t");
     const std::string_view word = std::string_view(line).substr(key, keyEnd - key);
-    if (keyEnd == line.size()) {
-        addParseError(line, key);
-    } else if (word == "rootCategory") {
+    if (word == "rootCategory" && keyEnd < line.size()) {
         readRootCategory(line, key, keyEnd);
-    } else if (word == "category" && line[keyEnd] == '.') {
+    } else if (word == "category" && isAt(line, keyEnd, '.')) {
         cat_cnf.push_back({_lines.lineno(), line.substr(keyEnd + 1)});
-    } else if (word == "appender" && line[keyEnd] == '.') {
+    } else if (word == "appender" && isAt(line, keyEnd, '.')) {
         readAppender(line, keyEnd + 1);
     } else {
         addParseError(line, key);
