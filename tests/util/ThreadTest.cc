@@ -166,8 +166,7 @@ TEST(ThreadTest, TheMainThreadsObjectIsBornReadyAndJoined) {
 TEST(ThreadTest, DestroyingAnUnjoinedThreadIsAnAssertion) {
     const ChildResult result = child([] {
         const Thread mainThread;
-        Worker worker("w");
-        worker.go();
+        const Worker worker("w");
         return true;
     });
     EXPECT_EQ(result.signal, SIGABRT);
