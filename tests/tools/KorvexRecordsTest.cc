@@ -395,13 +395,15 @@ TEST_F(KorvexRecordsTest, ACopyThatCannotBeMadeStopsBeforeAnyChange) {
 
 TEST_F(KorvexRecordsTest, TheCopyOfARunThatWasKilledIsRestored) {
     for (const char* verb : {"list", "dump"}) {
-        writeFile(_data, kVersion);  // cut off at the end of a record
+        writeFile(_data, kVersion + "\5");
         writeFile(_data + ".copy", kVersion + kA1);
-        EXPECT_EQ(statusOf({"check"}), 0);
-        EXPECT_EQ(readFile(_data), kVersion) << "check changes nothing";
+        EXPECT_EQ(statusOf({"check"}), 3);
+        EXPECT_EQ(readFile(_data), kVersion + "\5") << "check changes nothing";
         const ChildResult result = run({verb});
         EXPECT_EQ(result.status, 0);
-        EXPECT_THAT(result.err, HasSubstr("restored " + _data + " from its copy\n"));
+        EXPECT_THAT(result.err,
+                    HasSubstr("damaged at offset 31: key length cut short; restored from the copy "
+                              "of a former run that was cut off\n"));
         EXPECT_EQ(readFile(_data), kVersion + kA1);
         EXPECT_THAT(namesBesideData(), ElementsAre("data", "data.lock"));
     }

@@ -3,6 +3,7 @@
 #include <fcntl.h>
 #include <unistd.h>
 
+#include <csignal>
 #include <cstdio>
 #include <exception>
 
@@ -11,21 +12,27 @@
 
 namespace {
 
-// A closed standard descriptor would be given to the next file that is opened, and be written to.
-// Held open for reading only it makes writing fail instead.
-void occupyStandardDescriptors() {
-    int fd = 0;
-    do {
-        fd = open("/dev/null", O_RDONLY);
-    } while (fd >= 0 && fd <= STDERR_FILENO);
-    if (fd >= 0) close(fd);
+// Were 0 to 2 closed, the record file could be opened there and take what is meant for a stream.
+// Reading from 0 and writing to 1 then fail, what goes to 2 vanishes.
+void fillStandardDescriptors() {
+    for (const int fd : {STDIN_FILENO, STDOUT_FILENO, STDERR_FILENO}) {
+        if (fcntl(fd, F_GETFD) >= 0) continue;
+        // The lowest free number is this one.
+        static_cast<void>(open("/dev/null", fd == STDOUT_FILENO ? O_RDONLY : O_WRONLY));
+    }
 }
 
 // What the set-up prints is for people: it goes to standard error, so that standard output holds
 // just what was asked for.
 void setUp(int argc, char** argv, char** envp) {
-    const int out = dup(STDOUT_FILENO);
-    dup2(STDERR_FILENO, STDOUT_FILENO);
+    fillStandardDescriptors();
+    // A reader that is gone and a file size limit are told by the write that fails.
+    std::signal(SIGPIPE, SIG_IGN);
+    std::signal(SIGXFSZ, SIG_IGN);
+    const int out = fcntl(STDOUT_FILENO, F_DUPFD_CLOEXEC, STDERR_FILENO + 1);
+    if (out < 0 || dup2(STDERR_FILENO, STDOUT_FILENO) < 0) {
+        throw Failure(IO_ERROR, withErrno("cannot turn standard output aside"));
+    }
     LoaderInfo::common_main_setup(argc, argv, envp);
     std::fflush(stdout);
     dup2(out, STDOUT_FILENO);
@@ -44,7 +51,6 @@ Status run(int argc, char** argv) {
 
 int main(int argc, char** argv, char** envp) {
     try {
-        occupyStandardDescriptors();
         setUp(argc, argv, envp);
         return run(argc, argv);
     } catch (const Failure& failure) {

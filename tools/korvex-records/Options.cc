@@ -7,6 +7,7 @@
 #include <memory>
 #include <vector>
 
+#include "Output.h"
 #include "Status.h"
 
 namespace {
@@ -16,7 +17,7 @@ struct FreeContext {
 };
 using Context = std::unique_ptr<poptContext_s, FreeContext>;
 
-enum Action { VERSION = 'V', FILE_NAME = 'f', INPUT = 'i' };
+enum Action { VERSION = 'V', HELP = '?', FILE_NAME = 'f', INPUT = 'i' };
 
 struct Received {
     int longList = 0;
@@ -41,7 +42,7 @@ std::vector<poptOption> optionTable(Received& to) {
         {"force", '\0', POPT_ARG_NONE, &to.force, 0, "write to a damaged record file all the same",
          nullptr},
         {"version", '\0', POPT_ARG_NONE, nullptr, VERSION, "show the version", nullptr},
-        {nullptr, '\0', POPT_ARG_INCLUDE_TABLE, poptHelpOptions, 0, "Help options:", nullptr},
+        {"help", '?', POPT_ARG_NONE, nullptr, HELP, "show this text", nullptr},
         {nullptr, '\0', 0, nullptr, 0, nullptr, nullptr},
     };
 }
@@ -54,9 +55,12 @@ std::string takeText(poptContext context) {
 void act(int action, poptContext context, Options& options) {
     if (action == FILE_NAME) options.file = takeText(context);
     if (action == INPUT) options.input = takeText(context);
-    if (action != VERSION) return;
-    std::puts("korvex-records " KORVEX_VERSION);
-    std::exit(std::fflush(stdout) == 0 ? DONE : IO_ERROR);
+    // popt's own help would not notice when its output is lost.
+    if (action == HELP) poptPrintHelp(context, stdout, 0);
+    if (action == VERSION) std::puts("korvex-records " KORVEX_VERSION);
+    if (action != HELP && action != VERSION) return;
+    finishOutput();
+    std::exit(DONE);
 }
 
 }  // namespace

@@ -69,8 +69,8 @@ Status runCheck(const Options& options, const std::vector<std::string>&) {
     const Scan scanned = scan(file);
     if (scanned.missing) throw Failure(IO_ERROR, file + ": no such file");
     if (Pathname(file + ".copy").exists()) {
-        complain(file +
-                 ".copy is there: a run was cut off while it saved; the next one restores it");
+        complain(file + ".copy is there: a run was cut off while it saved; should " + file +
+                 " be damaged, the next one restores it");
     }
     const std::string count = std::to_string(scanned.records) + " records";
     if (!scanned.whole()) {

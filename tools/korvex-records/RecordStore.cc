@@ -58,19 +58,24 @@ Pathname recordFilePath(const Options& options) {
 }
 
 RecordStore::RecordStore(const Options& options)
-    : _file(recordFilePath(options)), _copy(_file + ".copy"), _force(options.force) {
+    : _file(recordFilePath(options)),
+      _new(_file + ".new"),
+      _copy(_file + ".copy"),
+      _force(options.force) {
     lock();
-    if (_copy.exists()) {
-        restoreCopy();
-        complain("a former run was cut off while it saved; restored " + _file + " from its copy");
-    }
     _scan = scan(_file);
-    _hadFile = !_scan.missing;
-    manager().setDBFile(_file);
-    try {
-        manager().readFile();
-    } catch (const ComponentException&) {  // logged; the scan has found the damage as well
+    if (!_scan.whole() && restoreCopy()) {
+        complain(_file + ": damaged at offset " + std::to_string(_scan.offset) + ": " +
+                 _scan.fault + "; restored from the copy of a former run that was cut off");
+        _scan = scan(_file);
     }
+    load();
+}
+
+RecordStore::~RecordStore() {
+    if (!_changing) return;
+    _new.unlink();
+    _copy.unlink();
 }
 
 // Without a lock file, which a directory that may only be read does not allow, nobody can be
@@ -81,6 +86,18 @@ void RecordStore::lock() {
     if (!_lock.valid()) return;
     while (flock(_lock.osdep(), LOCK_EX) != 0) {
         if (errno != EINTR) throw Failure(IO_ERROR, withErrno("cannot lock " + name));
+    }
+}
+
+void RecordStore::load() {
+    manager().setDBFile(_file);
+    try {
+        manager().readFile();
+    } catch (const ComponentException&) {  // logged; the scan has found the damage as well
+    }
+    // The store passes over what it cannot read; a change on top of that would lose it for good.
+    if (_scan.whole() && enumerate("").size() != _scan.records) {
+        throw Failure(IO_ERROR, "cannot read all of " + _file);
     }
 }
 
@@ -112,7 +129,10 @@ void RecordStore::beginChange() {
                                    ": " + _scan.fault + "; not written to without --force");
     }
     if (!_lock.valid()) throw Failure(IO_ERROR, withErrno("cannot lock " + _file + ".lock"));
-    makeSafeCopy(_file, _copy);
+    _changing = true;
+    if (!_scan.missing) makeSafeCopy(_file, _copy);
+    _new.unlink();  // what a killed run left must not pass for what is saved now
+    manager().setDBFile(_new);
 }
 
 void RecordStore::put(const std::string& key, const std::string& value) {
@@ -136,23 +156,33 @@ void RecordStore::save() {
 }
 
 void RecordStore::confirm() {
-    if (holdsWhatMemoryHolds() && syncFile(_file)) {
-        dropSafeCopy(_copy);
-        return;
+    if (!replaceFile()) {
+        throw Failure(IO_ERROR, "cannot save " + _file + " (the log says why); it is as it was");
     }
-    restoreCopy();
-    throw Failure(IO_ERROR, "cannot save " + _file + " (the log says why); it is as it was");
+    if (!_scan.missing) dropSafeCopy(_copy);
 }
 
-// An absent file's copy is an empty one, which loads as the same empty store.
-void RecordStore::restoreCopy() {
-    if (!_copy.renameTo(_file) || !syncFile(_file)) {
+bool RecordStore::replaceFile() {
+    if (!holdsWhatMemoryHolds(_new)) return false;
+    if (!_scan.missing && !takeAttributes(_file, _new)) return false;
+    if (!syncFile(_new) || !_new.renameTo(_file)) return false;
+    _changing = false;
+    syncDirectoryOf(_file);
+    if (holdsWhatMemoryHolds(_file)) return true;
+    restoreCopy();
+    return false;
+}
+
+// Without the lock some run may still be at work.
+bool RecordStore::restoreCopy() const {
+    if (!_lock.valid() || !_copy.exists() || !scan(_copy).whole()) return false;
+    if (!_copy.renameTo(_file)) {
         throw Failure(IO_ERROR, withErrno("cannot restore " + _file + " from " + _copy));
     }
     syncDirectoryOf(_file);
+    return true;
 }
 
-bool RecordStore::holdsWhatMemoryHolds() const {
-    std::vector<Record> records = enumerate("");
-    return fileHolds(_file, records);
+bool RecordStore::holdsWhatMemoryHolds(const Pathname& saved) const {
+    return fileHolds(saved, enumerate(""));
 }

@@ -3,7 +3,6 @@
 #include <korvex/util/FileDescriptor.h>
 #include <korvex/util/Pathname.h>
 
-#include <cstdint>
 #include <string>
 #include <vector>
 
@@ -11,8 +10,13 @@
 #include "Scan.h"
 
 // The record file, as the tool's runs share it. Opening takes a lock beside it (FILE.lock), so that
-// runs of the tool come one after the other, and puts back the copy (FILE.copy) that a run left
-// which was killed while it saved. All reading and writing goes through RecordFileManager.
+// runs of the tool come one after the other. All reading and writing goes through
+// RecordFileManager.
+//
+// RecordFileManager rewrites its file in place. So that FILE is whole at every moment, a change is
+// saved to FILE.new, compared with memory there, and renamed to FILE, while a copy of the old one
+// (FILE.copy) stands by. A run that is killed leaves the old FILE or the new one; its copy is put
+// back by the next run only if FILE is damaged then, by whatever it may be.
 class RecordStore {
   public:
     struct Record {
@@ -22,6 +26,10 @@ class RecordStore {
 
     // Throws Failure as the tool's statuses say.
     explicit RecordStore(const Options& options);
+    RecordStore(const RecordStore&) = delete;
+    RecordStore& operator=(const RecordStore&) = delete;
+    // Gives up a change that was not confirmed: the file is as it was.
+    ~RecordStore();
 
     // What a strict scan found before anything was loaded.
     const Scan& scanned() const { return _scan; }
@@ -40,20 +48,22 @@ class RecordStore {
     bool remove(const std::string& key);
     // Saves and confirms.
     void save();
-    // Looks whether the file now holds just what memory does. If it does not, puts the copy back
-    // and throws Failure IO_ERROR.
+    // Puts what was saved in the file's place if it holds just what memory does; throws Failure
+    // IO_ERROR otherwise, the file being as it was.
     void confirm();
 
   private:
     void lock();
-    void load(const Options& options);
-    void restoreCopy();
-    bool holdsWhatMemoryHolds() const;
+    void load();
+    bool restoreCopy() const;
+    bool replaceFile();
+    bool holdsWhatMemoryHolds(const Pathname& saved) const;
 
-    Pathname _file;
-    Pathname _copy;
-    bool _force;
-    bool _hadFile = false;
+    const Pathname _file;
+    const Pathname _new;
+    const Pathname _copy;
+    const bool _force;
+    bool _changing = false;
     ScopedFileDescriptor _lock;
     Scan _scan;
 };

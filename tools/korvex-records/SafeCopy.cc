@@ -8,31 +8,28 @@
 
 namespace {
 
-// Content, mode and, where we may, owner.
 bool copyWhole(const Pathname& from, const Pathname& to) {
     const ScopedFileDescriptor in(from);
     ScopedFileDescriptor out;
     out = to.openCreateOrReplace(Pathname::CREATE_PRIVATE);
-    struct stat st {};
-    if (!in.valid() || !out.valid() || !in.stat(&st)) return false;
-    if (fchown(out.osdep(), st.st_uid, st.st_gid) != 0) {  // then it becomes ours
-    }
-    return fchmod(out.osdep(), st.st_mode & 07777U) == 0 &&
-           in.copyTo(static_cast<FileDescriptor>(out)) && out.sync() == 0;
-}
-
-bool makeEmpty(const Pathname& path) {
-    ScopedFileDescriptor out;
-    out = path.openCreateOrReplace(Pathname::CREATE_PRIVATE);
-    return out.valid() && out.sync() == 0;
+    return in.valid() && out.valid() && in.copyTo(static_cast<FileDescriptor>(out)) &&
+           takeAttributes(from, to) && out.sync() == 0;
 }
 
 }  // namespace
 
+bool takeAttributes(const Pathname& from, const Pathname& to) {
+    struct stat theirs {};
+    struct stat own {};
+    if (!from.stat(&theirs) || !to.stat(&own)) return false;
+    const bool sameOwner = own.st_uid == theirs.st_uid && own.st_gid == theirs.st_gid;
+    return (sameOwner || chown(to.c_str(), theirs.st_uid, theirs.st_gid) == 0) &&
+           chmod(to.c_str(), theirs.st_mode & 07777U) == 0;
+}
+
 void makeSafeCopy(const Pathname& file, const Pathname& copy) {
     const Pathname unfinished(copy + ".unfinished");
-    const bool made = file.exists() ? copyWhole(file, unfinished) : makeEmpty(unfinished);
-    if (!made || !unfinished.renameTo(copy)) {
+    if (!copyWhole(file, unfinished) || !unfinished.renameTo(copy)) {
         const std::string why = withErrno("cannot make a copy of " + file);
         unfinished.unlink();
         throw Failure(IO_ERROR, why);

@@ -126,15 +126,16 @@ bool isRefusedKey(const std::string& key) {
 }
 
 Scan scan(const Pathname& file) {
-    const Stream stream(file.fopen("rb"));
-    if (!stream && errno == ENOENT) {
+    // Looked at before it is opened: a FIFO would hold us up for ever.
+    struct stat st {};
+    if (!file.stat(&st)) {
+        if (errno != ENOENT) throw Failure(IO_ERROR, withErrno("cannot open " + file));
         Scan result;
         result.missing = true;
         return result;
     }
-    if (!stream) throw Failure(IO_ERROR, withErrno("cannot open " + file));
-    struct stat st {};
-    if (fstat(fileno(stream.get()), &st) != 0) throw Failure(IO_ERROR, withErrno(file));
     if (!S_ISREG(st.st_mode)) throw Failure(IO_ERROR, file + " is no regular file");
+    const Stream stream(file.fopen("rb"));
+    if (!stream) throw Failure(IO_ERROR, withErrno("cannot open " + file));
     return Scanner(file, stream.get(), static_cast<std::uint64_t>(st.st_size)).run();
 }

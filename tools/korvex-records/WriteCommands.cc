@@ -1,37 +1,19 @@
-#include <fstream>
-#include <iostream>
-#include <iterator>
+#include <sstream>
 
 #include "Commands.h"
 #include "DumpFormat.h"
 #include "Escape.h"
+#include "Input.h"
 #include "RecordStore.h"
 
 namespace {
-
-std::string readAll(std::istream& in, const std::string& name) {
-    std::string all{std::istreambuf_iterator<char>(in), std::istreambuf_iterator<char>()};
-    if (in.bad()) throw Failure(IO_ERROR, withErrno("cannot read " + name));
-    return all;
-}
-
-std::ifstream openInput(const std::string& name) {
-    std::ifstream in(name, std::ios::binary);
-    in.peek();  // a directory opens, but cannot be read
-    if (!in.is_open() || in.bad()) throw Failure(IO_ERROR, withErrno("cannot read " + name));
-    in.clear();
-    return in;
-}
 
 std::string valueToPut(const Options& options, const std::vector<std::string>& arguments) {
     if (options.input.empty() == (arguments.size() == 1)) {
         throw Failure(USAGE, "put: KEY VALUE, KEY -, or -i FILE KEY");
     }
-    if (!options.input.empty()) {
-        std::ifstream in = openInput(options.input);
-        return readAll(in, options.input);
-    }
-    return arguments[1] == "-" ? readAll(std::cin, "standard input") : arguments[1];
+    if (!options.input.empty()) return readInputFile(options.input);
+    return arguments[1] == "-" ? readStandardInput() : arguments[1];
 }
 
 }  // namespace
@@ -68,13 +50,9 @@ Status runRemove(const Options& options, const std::vector<std::string>& argumen
 }
 
 Status runLoad(const Options& options, const std::vector<std::string>& arguments) {
-    Records records;
-    if (arguments.empty()) {
-        records = parseDump(std::cin);
-    } else {
-        std::ifstream in = openInput(arguments.front());
-        records = parseDump(in);
-    }
+    std::istringstream dump(arguments.empty() ? readStandardInput()
+                                              : readInputFile(arguments.front()));
+    const Records records = parseDump(dump);
     for (const auto& record : records) {
         if (isRefusedKey(record.first)) {
             throw Failure(USAGE, "refused key \"" + escaped(record.first) +

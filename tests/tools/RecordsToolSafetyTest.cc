@@ -1,0 +1,182 @@
+#include <sys/ptrace.h>
+#include <sys/resource.h>
+#include <sys/stat.h>
+#include <sys/wait.h>
+
+#include <csignal>
+
+#include "tools/RecordsTool.h"
+
+namespace {
+
+using namespace testsupport;
+using testing::Contains;
+using testing::ElementsAre;
+using testing::HasSubstr;
+using testing::Not;
+
+class SafetyTest : public RecordsToolTest {
+  protected:
+    // Runs the tool and kills it at its k-th stop, each system call being two; true when it had
+    // come to its end before.
+    bool runUntilStop(int k, const std::vector<std::string>& arguments) const {
+        const pid_t pid = fork();
+        if (pid == 0) {
+            ptrace(PTRACE_TRACEME, 0, nullptr, nullptr);
+            dup2(open("/dev/null", O_RDWR), 2);
+            execTool(arguments);
+        }
+        int status = 0;
+        while (waitpid(pid, &status, 0) == pid && WIFSTOPPED(status)) {
+            if (--k < 0) kill(pid, SIGKILL);
+            ptrace(PTRACE_SYSCALL, pid, nullptr, nullptr);
+        }
+        return WIFEXITED(status);
+    }
+};
+
+TEST_F(SafetyTest, AKillAtAnyMomentLeavesTheOldFileOrTheNewOne) {
+    const std::string before = fileOf({{"a", "1"}});
+    const std::string after = fileOf({{"a", "1"}, {"b", std::string(9000, 'x')}});
+    bool ended = false;
+    bool sawAfter = false;
+    for (int k = 0; !ended; ++k) {
+        writeFile(data, before);
+        ended = runUntilStop(k, {"put", "b", std::string(9000, 'x')});
+        const std::string left = stored();
+        sawAfter = sawAfter || (!ended && left == after);
+        ASSERT_TRUE(left == before || left == after) << "killed at stop " << k;
+    }
+    EXPECT_TRUE(sawAfter);
+    EXPECT_TRUE(stored() == after);
+    EXPECT_THAT(beside(), ElementsAre("data", "data.lock")) << "the run that ended tidies up";
+}
+
+TEST_F(SafetyTest, TheCopyOfAKilledRunDoesNotReplaceAWholeFile) {
+    const std::string newer = fileOf({{"a", "1"}, {"b", "2"}});
+    writeFile(data, newer);
+    writeFile(data + ".copy", fileOf({{"a", "1"}}));
+    EXPECT_EQ(run({"list"}).status, 0);
+    EXPECT_EQ(stored(), newer);
+    EXPECT_EQ(run({"put", "c", "3"}).status, 0);
+    EXPECT_EQ(stored(), fileOf({{"a", "1"}, {"b", "2"}, {"c", "3"}}));
+    EXPECT_THAT(beside(), ElementsAre("data", "data.lock"));
+}
+
+TEST_F(SafetyTest, ADamagedCopyIsNotPutBack) {
+    const std::string damaged = fileOf({{"a", "1"}}) + "\5";
+    writeFile(data, damaged);
+    writeFile(data + ".copy", fileOf({{"b", "1"}}) + "\5");
+    EXPECT_EQ(run({"list"}).status, 3);
+    EXPECT_EQ(stored(), damaged);
+}
+
+TEST_F(SafetyTest, WhatAKilledRunSavedAsideIsNotTakenForTheNext) {
+    writeFile(data + ".new", fileOf({{"x", "1"}}));
+    writeFile(data + ".copy.unfinished", "half");
+    EXPECT_EQ(run({"put", "a", "1"}).status, 0);
+    EXPECT_EQ(stored(), fileOf({{"a", "1"}}));
+}
+
+TEST_F(SafetyTest, AFifoDoesNotHoldTheToolUp) {
+    const std::string fifo = dir.file("fifo");
+    ASSERT_EQ(mkfifo(fifo.c_str(), 0600), 0);
+    for (const char* verb : {"list", "check"}) {
+        EXPECT_EQ(run({"-f", fifo, verb}).status, 4);
+        EXPECT_EQ(run({"-f", "/dev/zero", verb}).status, 4);
+    }
+}
+
+TEST_F(SafetyTest, AFileSizeLimitIsAFailedSaveAndNoDeath) {
+    EXPECT_EQ(run({"put", "a", std::string(3000, 'x')}).status, 0);
+    const std::string before = stored();
+    for (const rlim_t limit : {rlim_t{0}, rlim_t{1000}, rlim_t{3050}, rlim_t{6000}}) {
+        const ChildResult result = run({"put", "b", std::string(5000, 'y')}, "", [limit] {
+            const struct rlimit limits = {limit, limit};
+            setrlimit(RLIMIT_FSIZE, &limits);
+            dup2(open("/dev/null", O_WRONLY), 2);
+        });
+        EXPECT_EQ(result.status, 4) << limit;
+        EXPECT_TRUE(stored() == before);
+        EXPECT_THAT(beside(), ElementsAre("data", "data.lock"));
+    }
+}
+
+TEST_F(SafetyTest, AFailedFirstSaveLeavesNoFile) {
+    EXPECT_EQ(run({"put", "b", std::string(5000, 'y')}, "",
+                  [] {
+                      const struct rlimit limits = {4000, 4000};
+                      setrlimit(RLIMIT_FSIZE, &limits);
+                      dup2(open("/dev/null", O_WRONLY), 2);
+                  })
+                  .status,
+              4);
+    EXPECT_THAT(beside(), ElementsAre("data.lock"));
+}
+
+TEST_F(SafetyTest, ASaveKeepsTheModeAndFollowsLinks) {
+    writeFile(dir.file("real"), fileOf({{"a", "1"}}));
+    ASSERT_EQ(chmod(dir.file("real").c_str(), 0640), 0);
+    std::filesystem::create_symlink(dir.file("real"), data);
+    EXPECT_EQ(run({"put", "b", "2"}).status, 0);
+    EXPECT_TRUE(std::filesystem::is_symlink(data));
+    struct stat st;
+    ASSERT_EQ(stat(data.c_str(), &st), 0);
+    EXPECT_EQ(st.st_mode & 07777U, 0640U);
+    EXPECT_EQ(stored(), fileOf({{"a", "1"}, {"b", "2"}}));
+}
+
+TEST_F(SafetyTest, ANewFileIsForItsOwnerOnly) {
+    EXPECT_EQ(run({"put", "b", "2"}, "", [] { umask(0); }).status, 0);
+    struct stat st;
+    ASSERT_EQ(stat(data.c_str(), &st), 0);
+    EXPECT_EQ(st.st_mode & 07777U, 0600U);
+}
+
+TEST_F(SafetyTest, InputThatCannotBeReadIsNoEmptyInput) {
+    const auto closed = [] { close(0); };
+    const auto directory = [this] { dup2(open(dir.path().c_str(), O_RDONLY), 0); };
+    for (const std::function<void()>& prepare : {std::function<void()>(closed), {directory}}) {
+        EXPECT_EQ(run({"put", "k", "-"}, "", prepare).status, 4);
+        EXPECT_EQ(run({"load"}, "", prepare).status, 4);
+    }
+    EXPECT_EQ(run({"put", "-i", dir.path(), "k"}).status, 4);
+    EXPECT_EQ(run({"load", dir.path()}).status, 4);
+    EXPECT_THAT(beside(), testing::IsEmpty());
+}
+
+TEST_F(SafetyTest, ClosedStreamsHarmNothing) {
+    const auto allClosed = [] {
+        for (const int fd : {0, 1, 2})
+            close(fd);
+    };
+    EXPECT_EQ(run({"put", "a", "1"}, "", allClosed).status, 0);
+    EXPECT_EQ(stored(), fileOf({{"a", "1"}}));
+    EXPECT_EQ(run({"list"}, "", allClosed).status, 4);
+    EXPECT_EQ(run({"get", "a"}, "", [] { close(1); }).status, 4);
+    EXPECT_EQ(run({"put", "_record-file-version", "1"}, "", allClosed).status, 2);
+    EXPECT_EQ(stored(), fileOf({{"a", "1"}}));
+    EXPECT_EQ(run({"get", "a"}, "", [] { close(2); }).out, "1");
+    EXPECT_EQ(run({"get", "a"}, "", [] { dup2(open("/dev/full", O_WRONLY), 2); }).out, "1");
+}
+
+TEST_F(SafetyTest, AReaderThatIsGoneIsLostOutput) {
+    EXPECT_EQ(run({"put", "a", std::string(100000, 'x')}).status, 0);
+    EXPECT_EQ(run({"get", "a"}, "",
+                  [] {
+                      int ends[2];
+                      if (pipe(ends) != 0) _exit(99);
+                      dup2(ends[1], 1);
+                      close(ends[0]);
+                  })
+                  .status,
+              4);
+}
+
+TEST_F(SafetyTest, LostHelpIsNoticed) {
+    EXPECT_THAT(run({"--help"}).out, HasSubstr("--create"));
+    EXPECT_EQ(run({"--help"}).status, 0);
+    EXPECT_EQ(run({"--help"}, "", [] { dup2(open("/dev/full", O_WRONLY), 1); }).status, 4);
+}
+
+}  // namespace
