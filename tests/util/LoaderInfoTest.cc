@@ -302,8 +302,8 @@ TEST(ErrorMessageTest, EachCodeHasItsText) {
         "The environment variable KORVEX_HOME must point to a directory.",
         "The environment variable KORVEX_DB must point to a directory.",
         "The common config path must point to a directory.",
-        "The environment variable KORVEX_HOME must point to a directory that's writable the "
-        "process.",
+        ("The environment variable KORVEX_HOME must point to a directory that's writable the "
+         "process."),
         "The environment variable KORVEX_DB must point to a directory that's writable the process.",
         "The component name must not be empty.",
         "The install name must not be empty.",
