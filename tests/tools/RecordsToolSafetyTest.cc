@@ -90,10 +90,14 @@ TEST_F(SafetyTest, AFifoDoesNotHoldTheToolUp) {
 TEST_F(SafetyTest, AFileSizeLimitIsAFailedSaveAndNoDeath) {
     EXPECT_EQ(run({"put", "a", std::string(3000, 'x')}).status, 0);
     const std::string before = stored();
-    for (const rlim_t limit : {rlim_t{0}, rlim_t{1000}, rlim_t{3050}, rlim_t{6000}}) {
+    std::vector<rlim_t> limits{1000, 3050, 6000};
+#ifndef __SANITIZE_THREAD__  // whose runtime itself dies of a limit of 0 before main begins
+    limits.push_back(0);
+#endif
+    for (const rlim_t limit : limits) {
         const ChildResult result = run({"put", "b", std::string(5000, 'y')}, "", [limit] {
-            const struct rlimit limits = {limit, limit};
-            setrlimit(RLIMIT_FSIZE, &limits);
+            const struct rlimit both = {limit, limit};
+            setrlimit(RLIMIT_FSIZE, &both);
             dup2(open("/dev/null", O_WRONLY), 2);
         });
         EXPECT_EQ(result.status, 4) << limit;
