@@ -68,4 +68,13 @@ ChildResult runInChild(const std::function<int()>& body, unsigned seconds) {
     return result;
 }
 
+std::string ownStderr() {
+    std::string all;
+    char buf[4096];
+    for (ssize_t n;
+         (n = pread(STDERR_FILENO, buf, sizeof buf, static_cast<off_t>(all.size()))) > 0;)
+        all.append(buf, static_cast<std::size_t>(n));
+    return all;
+}
+
 }  // namespace testsupport

@@ -17,4 +17,7 @@ struct ChildResult {
 // after `seconds`. For whatever a process can do only once.
 ChildResult runInChild(const std::function<int()>& body, unsigned seconds = 60);
 
+// What the calling child has written to its standard error so far.
+std::string ownStderr();
+
 }  // namespace testsupport

@@ -14,6 +14,8 @@
 #include <cstdarg>
 #include <cstddef>
 #include <cstdio>
+#include <cstdlib>
+#include <iterator>
 #include <new>
 
 namespace testsupport {
@@ -59,6 +61,53 @@ bool fails(Call call) {
 }
 
 }  // namespace
+
+const char* nameOf(Call call) {
+    static constexpr const char* names[] = {
+        "open",
+        "read",
+        "write",
+        "writev",
+        "close",
+        "fstat",
+        "stat",
+        "access",
+        "lseek",
+        "fcntl",
+        "fsync",
+        "rename",
+        "unlink",
+        "fopen",
+        "fread",
+        "fwrite",
+        "fclose",
+        "calloc",
+        "new_array",
+        "allocation",
+        "fgets",
+        "gettimeofday",
+        "localtime_r",
+        "strftime",
+        "strerror_r",
+        "setenv",
+        "pthread_create",
+        "pthread_attr_init",
+        "pthread_attr_setstacksize",
+        "pthread_mutex_init",
+        "pthread_mutex_lock",
+        "pthread_mutex_unlock",
+        "pthread_mutex_trylock",
+        "pthread_mutex_destroy",
+        "pthread_join",
+        "pthread_cond_init",
+        "pthread_cond_wait",
+        "pthread_cond_clockwait",
+        "pthread_key_create",
+        "pthread_setspecific",
+    };
+    static_assert(std::size(names) == static_cast<std::size_t>(Call::COUNT));
+    return names[static_cast<std::size_t>(call)];
+}
 
 CountCalls::CountCalls(Call call) : _call(call) {
     Plan& plan = planOf(call);
@@ -182,10 +231,9 @@ size_t __wrap_fwrite(const void* p, size_t size, size_t n, FILE* file) {
     return __real_fwrite(p, size, std::min<size_t>(n, verdict.limit), file);
 }
 
-void* __real__Znam(size_t n);
-void* __wrap__Znam(size_t n) {
-    if (fails(Call::new_array)) throw std::bad_alloc();
-    return __real__Znam(n);
+char* __real_fgets(char* p, int n, FILE* file);
+char* __wrap_fgets(char* p, int n, FILE* file) {
+    return fails(Call::fgets) ? nullptr : __real_fgets(p, n, file);
 }
 
 int __real_close(int fd);
@@ -216,6 +264,7 @@ int __wrap_pthread_join(pthread_t thread, void** result) {
 FORWARD(-1, ssize_t, writev, (int fd, const struct iovec* vec, int n), (fd, vec, n))
 FORWARD(-1, int, fstat, (int fd, struct stat* st), (fd, st))
 FORWARD(-1, int, stat, (const char* path, struct stat* st), (path, st))
+FORWARD(-1, int, access, (const char* path, int mode), (path, mode))
 FORWARD(-1, off_t, lseek, (int fd, off_t off, int whence), (fd, off, whence))
 FORWARD(-1, int, fsync, (int fd), (fd))
 FORWARD(-1, int, rename, (const char* from, const char* to), (from, to))
@@ -258,3 +307,26 @@ FORWARD_NUMBER(Call::pthread_setspecific, pthread_setspecific,
                (pthread_key_t key, const void* value), (key, value))
 
 }  // extern "C"
+
+// Replaced for the whole program, so that allocations made inside the C++ library count too.
+void* operator new(std::size_t n) {
+    if (fails(Call::allocation)) throw std::bad_alloc();
+    if (void* const p = std::malloc(std::max<std::size_t>(n, 1))) return p;
+    throw std::bad_alloc();
+}
+void* operator new[](std::size_t n) {
+    if (fails(Call::new_array)) throw std::bad_alloc();
+    return operator new(n);
+}
+void operator delete(void* p) noexcept {
+    std::free(p);
+}
+void operator delete[](void* p) noexcept {
+    std::free(p);
+}
+void operator delete(void* p, std::size_t) noexcept {
+    std::free(p);
+}
+void operator delete[](void* p, std::size_t) noexcept {
+    std::free(p);
+}

@@ -4,7 +4,7 @@ namespace testsupport {
 
 // The library's calls that a test can count or make fail. They reach the hooks through the
 // linker's --wrap (WrappedCalls.cmake), so the product code knows nothing of them. Calls made
-// inside the C and C++ libraries themselves are not seen.
+// inside the C and C++ libraries themselves are not seen, allocations excepted.
 enum class Call {
     open,
     read,
@@ -13,6 +13,7 @@ enum class Call {
     close,
     fstat,
     stat,
+    access,
     lseek,
     fcntl,
     fsync,
@@ -23,7 +24,9 @@ enum class Call {
     fwrite,
     fclose,
     calloc,
-    new_array,  // operator new[]; a failure throws std::bad_alloc
+    new_array,   // operator new[]; a failure throws std::bad_alloc
+    allocation,  // operator new and new[], those inside the C++ library included
+    fgets,
     gettimeofday,
     localtime_r,
     strftime,
@@ -45,6 +48,9 @@ enum class Call {
     pthread_setspecific,
     COUNT
 };
+
+// The call's name, for messages.
+const char* nameOf(Call call);
 
 // Counts a call for as long as this object lives. One object a call at a time.
 class CountCalls {

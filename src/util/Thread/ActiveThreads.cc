@@ -4,6 +4,7 @@
 #include "base/NeverDestroyed.h"
 #include "util/ThreadObj/ThreadLogger.h"
 
+#include <exception>
 #include <memory>
 #include <new>
 
@@ -22,33 +23,38 @@ Mutex& registryMutex() {
 
 }  // namespace
 
+// A thread that cannot be registered runs all the same: it is not counted, so nobody waits for it
+// to be struck off.
 void ActiveThreads::add(Thread* thrptr) {
     _current = thrptr;
-    bool haveKey = false;
-    {
-        const ScopedMutex lock(registryMutex());
-        countIn();
-        haveKey = _ptrs != nullptr;
-        if (haveKey) setSlot(thrptr);
+    bool registered = false;
+    try {
+        registered = countIn(thrptr);
+    } catch (const std::exception&) {  // no key, or no room for the slot: told by the check
     }
-    if (!haveKey) {
+    if (!registered) {
         threadLogger().error(
             "Could not construct ThreadSpecificPointer<Thread> in ActiveThreads::add");
     }
 }
 
-// Without the memory for a key nobody would strike the thread off, so it does not count.
-void ActiveThreads::countIn() {
+bool ActiveThreads::countIn(Thread* thrptr) {
+    const ScopedMutex lock(registryMutex());
+    std::unique_ptr<TSP_Implementor> made;
     if (_nthreads == 0) {
         KORVEX_ASSERT_AS(_ptrs == nullptr, "_ptrs == NULL");
-        _ptrs = new (std::nothrow) TSP_Implementor(&ActiveThreads::remove);
+        made.reset(new (std::nothrow) TSP_Implementor(&ActiveThreads::remove));
+        if (made == nullptr) return false;
     }
-    if (_ptrs != nullptr) ++_nthreads;
+    setSlot(made != nullptr ? *made : *_ptrs, thrptr);
+    if (made != nullptr) _ptrs = made.release();
+    ++_nthreads;
+    return true;
 }
 
-void ActiveThreads::setSlot(Thread* thrptr) {
-    KORVEX_ASSERT_AS(_ptrs->get() == nullptr, "_ptrs->get() == NULL");
-    _ptrs->set(thrptr);
+void ActiveThreads::setSlot(TSP_Implementor& ptrs, Thread* thrptr) {
+    KORVEX_ASSERT_AS(ptrs.get() == nullptr, "_ptrs->get() == NULL");
+    ptrs.set(thrptr);
 }
 
 void ActiveThreads::remove(void*) {

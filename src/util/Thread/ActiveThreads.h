@@ -15,8 +15,8 @@ class ActiveThreads {
     static void forgetCurrent() { _current = nullptr; }
 
   private:
-    static void countIn();
-    static void setSlot(Thread* thrptr);
+    static bool countIn(Thread* thrptr);
+    static void setSlot(TSP_Implementor& ptrs, Thread* thrptr);
     static void remove(void* unused);
 
     // A thread-specific key exists only while there are workers: its clean-up strikes them off and

@@ -77,7 +77,8 @@ class RecordFileManager {
     // Adds the file's records to those in memory. A file that cannot be opened is silently none.
     // One that is cut short is told by logged errors; what was read before stays, and a value cut
     // short is stored with its full length, zero bytes where there was nothing to read. Throws
-    // ComponentException when memory runs out, and when a cut file held no version record.
+    // ComponentException when memory for a key or a value runs out (std::bad_alloc when it is the
+    // map's), and when a cut file held no version record.
     void readFile();
     // The same for those records of another file whose keys begin with the prefix. Saves nothing
     // and leaves this store's file and version alone.
@@ -85,7 +86,7 @@ class RecordFileManager {
     // Rewrites the record file: the version record, then all records in key order. Failures to
     // open, write or close it are logged. The process's umask is 066 afterwards, and stays so:
     // later files, log files among them, become 0600. Throws ComponentException when no file is
-    // named.
+    // named, and std::bad_alloc when memory runs out, the file then being cut as by a failed write.
     void saveToFile();
 
     // Steps of the above, for tests and tools.

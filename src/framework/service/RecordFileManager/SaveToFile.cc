@@ -1,6 +1,7 @@
 #include <korvex/framework/service/ComponentException.h>
 #include <korvex/framework/service/RecordFileManager.h>
 
+#include "base/Stream.h"
 #include "framework/service/RecordFileManager/RecordFormat.h"
 #include "framework/service/RecordFileManager/StoreLogger.h"
 
@@ -50,25 +51,24 @@ void RecordFileManager::saveToFile() {
         throw ComponentException(storeLogger(), "Tried to write to db without setting filename.");
     }
     umask(066);  // the records are nobody else's business; never set back
-    std::FILE* const file = dbHomePath.fopen("wb");
-    if (file == nullptr) {
+    Stream file(dbHomePath.fopen("wb"));
+    if (!file) {
         __extension__ storeLogger().error(
             "Unable to open record file for writing at '%s'.  Cannot save hash data.  Error is "
             "%d: %m.",
             dbHomePath.c_str(), errno);
         return;
     }
-    writeRecord(file, std::string(VERSION_KEY), static_cast<unsigned>(VERSION_STR.size()),
+    writeRecord(file.get(), std::string(VERSION_KEY), static_cast<unsigned>(VERSION_STR.size()),
                 VERSION_STR.data());
     for (const auto& [key, value] : records) {
-        if (writeRecord(file, key, value.first, value.second)) continue;
+        if (writeRecord(file.get(), key, value.first, value.second)) continue;
         reportFailedWrite();
-        std::clearerr(file);
-        std::fclose(file);
+        std::clearerr(file.get());
         return;
     }
     // A full disk shows here at the latest.
-    if (std::fclose(file) != 0) reportFailedWrite();
+    if (std::fclose(file.release()) != 0) reportFailedWrite();
 }
 
 }  // namespace korvex
