@@ -4,6 +4,9 @@ target_compile_options(korvex_flags INTERFACE
   -Wall -Wextra -Wpedantic -Wconversion -Wshadow
   # __FILE__ in assertions reads "src/..." wherever the tree lies.
   "-fmacro-prefix-map=${PROJECT_SOURCE_DIR}/=")
+if(CMAKE_CXX_COMPILER_ID MATCHES Clang)
+  target_compile_options(korvex_flags INTERFACE -Wthread-safety)
+endif()
 if(KORVEX_WERROR)
   target_compile_options(korvex_flags INTERFACE -Werror)
 endif()

@@ -49,14 +49,14 @@ class InThreadActorQueue {
     bool waitForWork(unsigned int timeoutSecs);
 
   private:
-    void append(InThreadActor& actor);
+    void append(InThreadActor& actor) KORVEX_REQUIRES(_mutex);
     InThreadActor* takeFirst();
     void markRan(InThreadActor& actor);
 
     Mutex _mutex;  // guards the list and the actors' bookkeeping
     ConditionWakeAll _submitted;
-    InThreadActor* _first = nullptr;
-    InThreadActor** _lastp = &_first;
+    InThreadActor* _first KORVEX_GUARDED_BY(_mutex) = nullptr;
+    InThreadActor** _lastp KORVEX_GUARDED_BY(_mutex) = &_first;
 };
 
 // A thread. Derive, implement main(), build the object, call go(), and join() it exactly once:
@@ -69,6 +69,9 @@ class InThreadActorQueue {
 // The operating-system thread starts in the constructor, with a stack of 1 MiB, and waits at a gate
 // until go(), so that main() never meets a half-built object. An exception that leaves main() ends
 // the process (std::terminate). join() and the destructor belong to one thread.
+//
+// After fork(2) the child has none of the parent's threads: it must not join or destroy their
+// objects, and may build Threads of its own only if the parent was building and ending none.
 class Thread : public PthreadObject {
   public:
     // Joins and then deletes its thread. Queue it on another thread (submit(), never

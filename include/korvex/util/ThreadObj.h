@@ -1,5 +1,7 @@
 #pragma once
 
+#include <korvex/util/ThreadSafety.h>
+
 #include <pthread.h>
 
 #include <cstdint>
@@ -42,7 +44,7 @@ class PthreadToken {
 
 // A plain, non-recursive lock with POSIX's default attributes: locking it twice from one thread
 // deadlocks. Any thread may use it. "Checked" below: by PthreadObject::checkPtRes.
-class Mutex : public PthreadObject {
+class KORVEX_CAPABILITY("mutex") Mutex : public PthreadObject {
   public:
     // Checked.
     Mutex();
@@ -52,15 +54,15 @@ class Mutex : public PthreadObject {
     ~Mutex() noexcept(false);
 
     // Checked; a lock that fails is not held.
-    void lock();
-    void unlock();
+    void lock() KORVEX_ACQUIRE();
+    void unlock() KORVEX_RELEASE();
     // Whether the lock was free and is now held. Any failure but "busy" is checked.
-    bool tryLock();
+    bool tryLock() KORVEX_TRY_ACQUIRE(true);
 
     // For code that must not log: unchecked. True when the lock is held.
-    bool NOLOG_lock();
+    bool NOLOG_lock() KORVEX_TRY_ACQUIRE(true);
     // pthread_mutex_unlock(3)'s own result.
-    int NOLOG_unlock();
+    int NOLOG_unlock() KORVEX_RELEASE();
 
   private:
     friend class ConditionBaseClass;
@@ -88,20 +90,20 @@ class RecursiveMutex {
 
     Mutex _mutex;        // the lock that is really held
     Mutex _owner_mutex;  // guards the rest; held briefly, never while blocking on _mutex
-    PthreadToken _owner;
-    bool _owner_valid = false;
-    std::uint32_t _owner_count = 0;
+    PthreadToken _owner KORVEX_GUARDED_BY(_owner_mutex);
+    bool _owner_valid KORVEX_GUARDED_BY(_owner_mutex) = false;
+    std::uint32_t _owner_count KORVEX_GUARDED_BY(_owner_mutex) = 0;
 };
 
 // Holds a Mutex for a scope.
-class ScopedMutex {
+class KORVEX_SCOPED_CAPABILITY ScopedMutex {
   public:
     // Locks; throws what Mutex::lock throws.
-    explicit ScopedMutex(Mutex& mutex);
+    explicit ScopedMutex(Mutex& mutex) KORVEX_ACQUIRE(mutex);
     ScopedMutex(const ScopedMutex&) = delete;
     ScopedMutex& operator=(const ScopedMutex&) = delete;
     // Unlocks; a failure throws unless another exception is on its way.
-    ~ScopedMutex() noexcept(false);
+    ~ScopedMutex() noexcept(false) KORVEX_RELEASE();
 
   private:
     friend class ConditionBaseClass;
@@ -111,14 +113,14 @@ class ScopedMutex {
 };
 
 // Lets go of a Mutex, which the caller holds, for a scope.
-class ScopedMutexUnlocker {
+class KORVEX_SCOPED_CAPABILITY ScopedMutexUnlocker {
   public:
     // Unlocks; throws what Mutex::unlock throws.
-    explicit ScopedMutexUnlocker(Mutex& mutex);
+    explicit ScopedMutexUnlocker(Mutex& mutex) KORVEX_RELEASE(mutex);
     ScopedMutexUnlocker(const ScopedMutexUnlocker&) = delete;
     ScopedMutexUnlocker& operator=(const ScopedMutexUnlocker&) = delete;
     // Locks again; a failure throws unless another exception is on its way.
-    ~ScopedMutexUnlocker() noexcept(false);
+    ~ScopedMutexUnlocker() noexcept(false) KORVEX_RELEASE();
 
   private:
     Mutex& _mutex;
@@ -136,13 +138,14 @@ class ConditionBaseClass : public PthreadObject {
     ~ConditionBaseClass() noexcept(false);
 
     // Waits, giving the mutex, which the caller holds, free meanwhile. Checked.
-    void wait(Mutex& mutex);
-    void wait(ScopedMutex& guard) { wait(guard._mutex); }
+    void wait(Mutex& mutex) KORVEX_REQUIRES(mutex);
+    // (The analysis does not know that a guard holds its mutex.)
+    void wait(ScopedMutex& guard) KORVEX_NO_THREAD_SAFETY_ANALYSIS { wait(guard._mutex); }
     // The same for at most timeoutSecs seconds from now, by a clock that nobody sets where the
     // platform has one. True when woken, false when the time is over; other failures are checked,
     // under the name "pthread_cond_timedwait_relative_np" on every platform, and then false.
-    bool wait(Mutex& mutex, unsigned int timeoutSecs);
-    bool wait(ScopedMutex& guard, unsigned int timeoutSecs) {
+    bool wait(Mutex& mutex, unsigned int timeoutSecs) KORVEX_REQUIRES(mutex);
+    bool wait(ScopedMutex& guard, unsigned int timeoutSecs) KORVEX_NO_THREAD_SAFETY_ANALYSIS {
         return wait(guard._mutex, timeoutSecs);
     }
 

@@ -59,8 +59,9 @@ std::uint32_t saturated(const char* digits) {
 
 }  // namespace
 
+// This and finalSetup() belong to start-up, before other threads log, and take no lock.
 bool LogAppender::setAttribute(const std::string& aname, const char* val,
-                               const Pathname& korvexHome) {
+                               const Pathname& korvexHome) KORVEX_NO_THREAD_SAFETY_ANALYSIS {
     if (aname == "fileName") {
         if (this != &rootAppender()) closeFd();
         _filename = expandHome(val, korvexHome);
@@ -90,7 +91,7 @@ bool LogAppender::setAttribute(const std::string& aname, const char* val,
     return false;
 }
 
-void LogAppender::finalSetup(const char* name) {
+void LogAppender::finalSetup(const char* name) KORVEX_NO_THREAD_SAFETY_ANALYSIS {
     if (_fmt == nullptr) _fmt = &rootAppender().layout();
     if (_filename.empty()) {
         if (!_fd.valid()) {

@@ -9,21 +9,17 @@ inline namespace korvex {
 std::atomic<bool> logger_initialized{false};
 Logger* EarlyLoggers::uninitialized_loggers = nullptr;
 
-namespace {
-
-Mutex& listMutex() {
-    static NeverDestroyed<Mutex> mutex;
-    return *mutex;
+Mutex& EarlyLoggers::mutex() {
+    static NeverDestroyed<Mutex> instance;
+    return *instance;
 }
-
-}  // namespace
 
 void EarlyLoggers::bind(Logger& logger) {
     logger._channel.store(LogChannel::find(logger._channel_name, false), std::memory_order_release);
 }
 
 void EarlyLoggers::add(Logger& logger) {
-    const NologLock lock(listMutex());
+    const NologLock lock(mutex());
     if (logger_initialized) {
         bind(logger);
         return;
@@ -33,7 +29,7 @@ void EarlyLoggers::add(Logger& logger) {
 }
 
 void EarlyLoggers::remove(Logger& logger) {
-    const NologLock lock(listMutex());
+    const NologLock lock(mutex());
     for (Logger** link = &uninitialized_loggers; *link != nullptr; link = &(*link)->_next) {
         if (*link == &logger) {
             *link = logger._next;
@@ -43,7 +39,7 @@ void EarlyLoggers::remove(Logger& logger) {
 }
 
 bool EarlyLoggers::isUnusable(const Logger& logger) {
-    const NologLock lock(listMutex());
+    const NologLock lock(mutex());
     if (logger_initialized) return false;  // it has been emptied meanwhile
     for (const Logger* l = uninitialized_loggers; l != nullptr; l = l->_next) {
         if (l == &logger) return false;
@@ -52,7 +48,7 @@ bool EarlyLoggers::isUnusable(const Logger& logger) {
 }
 
 void EarlyLoggers::initialize() {
-    const NologLock lock(listMutex());
+    const NologLock lock(mutex());
     KORVEX_ASSERT(!logger_initialized);
     epoch_timeval();
     logger_initialized = true;

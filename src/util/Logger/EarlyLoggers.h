@@ -1,6 +1,7 @@
 #pragma once
 
 #include <korvex/util/Logger.h>
+#include <korvex/util/ThreadObj.h>
 
 #include <atomic>
 
@@ -22,10 +23,13 @@ class EarlyLoggers {
     // Marks logging as initialised and binds every logger on the list, newest first.
     static void initialize();
 
+    // Guards the list.
+    static Mutex& mutex();
+
   private:
     static void bind(Logger& logger);
 
-    static Logger* uninitialized_loggers;
+    static Logger* uninitialized_loggers KORVEX_GUARDED_BY(mutex());
 };
 
 }  // namespace korvex

@@ -3,32 +3,21 @@
 #include <korvex/util/Logger/LogMsgMetadata.h>
 
 #include "base/NeverDestroyed.h"
+#include "util/Logger/ChannelRegistry.h"
 #include "util/Logger/LevelWords.h"
 #include "util/Logger/NologLock.h"
 #include "util/Logger/Reporting.h"
 #include "util/Logger/RootObjects.h"
 
 #include <cstring>
-#include <map>
 #include <memory>
 
 inline namespace korvex {
 
-namespace {
-
-// Channels are made at any time by setChannelLevel and looked up by loggers being built, so this
-// map, unlike the appenders', has a lock.
-struct Registry {
-    Mutex mutex;
-    std::map<std::string, std::unique_ptr<LogChannel>> channels;
-};
-
-Registry& registry() {
-    static NeverDestroyed<Registry> instance;
-    return *instance;
+ChannelRegistry& ChannelRegistry::instance() {
+    static NeverDestroyed<ChannelRegistry> registry;
+    return *registry;
 }
-
-}  // namespace
 
 LogChannel::LogChannel() : minlevel(INFO) {}
 
@@ -36,7 +25,7 @@ LogChannel::LogChannel(const LogChannel& other)
     : minlevel(other.minlevel.load(std::memory_order_relaxed)), _appenders(other._appenders) {}
 
 LogChannel* LogChannel::find(const std::string& name, bool create) {
-    Registry& known = registry();
+    ChannelRegistry& known = ChannelRegistry::instance();
     const NologLock lock(known.mutex);
     const auto found = known.channels.find(name);
     if (found != known.channels.end()) return found->second.get();

@@ -1,6 +1,7 @@
 #include <korvex/util/Logger.h>
 
 #include "util/Logger/EarlyLoggers.h"
+#include "util/Logger/LoggingLocks.h"
 #include "util/Logger/RootObjects.h"
 
 #include <cstring>
@@ -45,6 +46,9 @@ bool Logger::isDebugEnabled() const {
 }
 
 namespace {
+
+// Before main(), so that no fork comes first.
+[[maybe_unused]] const bool forkSafe = (LoggingLocks::keepThroughForks(), true);
 
 constexpr const char* percent_s = "%s";
 

@@ -13,15 +13,10 @@ inline namespace korvex {
 TSP_Implementor* ActiveThreads::_ptrs = nullptr;
 int ActiveThreads::_nthreads = 0;
 
-namespace {
-
-// Guards the count, and the key's making and end.
-Mutex& registryMutex() {
+Mutex& ActiveThreads::mutex() {
     static NeverDestroyed<Mutex> _mutex;
     return *_mutex;
 }
-
-}  // namespace
 
 // A thread that cannot be registered runs all the same: it is not counted, so nobody waits for it
 // to be struck off.
@@ -39,7 +34,7 @@ void ActiveThreads::add(Thread* thrptr) {
 }
 
 bool ActiveThreads::countIn(Thread* thrptr) {
-    const ScopedMutex lock(registryMutex());
+    const ScopedMutex lock(mutex());
     std::unique_ptr<TSP_Implementor> made;
     if (_nthreads == 0) {
         KORVEX_ASSERT_AS(_ptrs == nullptr, "_ptrs == NULL");
@@ -59,7 +54,7 @@ void ActiveThreads::setSlot(TSP_Implementor& ptrs, Thread* thrptr) {
 
 void ActiveThreads::remove(void*) {
     _current = nullptr;
-    const ScopedMutex lock(registryMutex());
+    const ScopedMutex lock(mutex());
     KORVEX_ASSERT_AS(_ptrs != nullptr, "_ptrs != NULL");
     if (--_nthreads > 0) return;
     const std::unique_ptr<TSP_Implementor> last(_ptrs);

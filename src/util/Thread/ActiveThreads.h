@@ -25,8 +25,11 @@ class ActiveThreads {
     // ending threads too.
     static inline thread_local Thread* _current = nullptr;
 
-    static TSP_Implementor* _ptrs;
-    static int _nthreads;
+    // Guards the count, and the key's making and end.
+    static Mutex& mutex();
+
+    static TSP_Implementor* _ptrs KORVEX_GUARDED_BY(mutex());
+    static int _nthreads KORVEX_GUARDED_BY(mutex());
 };
 
 }  // namespace korvex

@@ -5,15 +5,10 @@
 
 inline namespace korvex {
 
-namespace {
-
-// One lock for all gates: they are used once a thread.
-Mutex& readyToRunLock() {
+Mutex& Thread::Gate::readyToRunLock() {
     static NeverDestroyed<Mutex> ready_to_run_lock;
     return *ready_to_run_lock;
 }
-
-}  // namespace
 
 void Thread::Gate::open() {
     const ScopedMutex lock(readyToRunLock());

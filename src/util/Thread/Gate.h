@@ -16,8 +16,11 @@ class Thread::Gate {
     bool pass();
 
   private:
-    bool _ready_to_run = false;
-    bool _abandoned = false;
+    // One lock for all gates: they are used once a thread.
+    static Mutex& readyToRunLock();
+
+    bool _ready_to_run KORVEX_GUARDED_BY(readyToRunLock()) = false;
+    bool _abandoned KORVEX_GUARDED_BY(readyToRunLock()) = false;
     ConditionWakeAll _ready_to_run_cond;
 };
 

@@ -23,7 +23,7 @@ ScopedMutex::ScopedMutex(Mutex& mutex) : _mutex(mutex), _exceptions(std::uncaugh
 }
 
 ScopedMutex::~ScopedMutex() noexcept(false) {
-    unlessUnwinding(_exceptions, [this] { _mutex.unlock(); });
+    unlessUnwinding(_exceptions, [this]() KORVEX_NO_THREAD_SAFETY_ANALYSIS { _mutex.unlock(); });
 }
 
 ScopedMutexUnlocker::ScopedMutexUnlocker(Mutex& mutex)
@@ -32,7 +32,7 @@ ScopedMutexUnlocker::ScopedMutexUnlocker(Mutex& mutex)
 }
 
 ScopedMutexUnlocker::~ScopedMutexUnlocker() noexcept(false) {
-    unlessUnwinding(_exceptions, [this] { _mutex.lock(); });
+    unlessUnwinding(_exceptions, [this]() KORVEX_NO_THREAD_SAFETY_ANALYSIS { _mutex.lock(); });
 }
 
 }  // namespace korvex

@@ -38,6 +38,9 @@ struct PersistentFullData {
 // callers; the first instance() comes before other threads use the store. One process at a time
 // should use a file: nothing locks it.
 //
+// A child of fork(2) may use the store, of which it has its own copy, whatever put() calls were under
+// way in the parent's other threads; its file is the parent's still, so it should name its own.
+//
 // What it does not promise: a save rewrites the file in place, without fsync(2), so a crash or a
 // full disk in its middle leaves the file cut after its last complete write (memory is never
 // touched by a failed save). A value that put() replaces is never freed. A key is NUL-terminated
@@ -62,7 +65,8 @@ class RecordFileManager {
     // writeToFile is true. The key "_record-file-version" is refused with a logged error. Throws
     // ComponentException "Unable to allocate memory for storing hash value.", the store being as
     // it was, and what saveToFile() throws, the value being stored.
-    void put(const std::string& key, const PersistentHashData& data, bool writeToFile);
+    void put(const std::string& key, const PersistentHashData& data, bool writeToFile)
+        KORVEX_EXCLUDES(_mutex);
     // Hands out a copy of the value, which the caller frees with delete[] static_cast<char*>(p);
     // never null, even for a value of size 0. For an absent key _pData is null and _size untouched.
     void get(const std::string& key, PersistentHashData& dataToReturn) const;
@@ -101,6 +105,8 @@ class RecordFileManager {
     class Loader;
 
     RecordFileManager() = default;
+
+    static void keepLockThroughForks();
 
     void load(const Pathname& file, const std::string& prefix, std::string& version);
     void insert(const std::string& key, std::uint32_t size, void* block);

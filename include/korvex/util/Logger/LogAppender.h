@@ -68,26 +68,31 @@ class LogAppender {
   private:
     class Report;
 
+    friend class LoggingLocks;
+
     bool writesToFile() const;
     const LogFormat& layout() const;
-    void writeLine(const std::string& line, long long now, Report& report);
-    void checkIdentity(long long now);
-    bool openFile(Report& report);
-    bool openAndInitFile(long long now, Report& report);
-    void rotateFile(long long now, Report& report);
-    void closeFd();
+    void writeLine(const std::string& line, long long now, Report& report) KORVEX_REQUIRES(_mutex);
+    void checkIdentity(long long now) KORVEX_REQUIRES(_mutex);
+    bool openFile(Report& report) KORVEX_REQUIRES(_mutex);
+    bool openAndInitFile(long long now, Report& report) KORVEX_REQUIRES(_mutex);
+    void rotateFile(long long now, Report& report) KORVEX_REQUIRES(_mutex);
+    void closeFd() KORVEX_REQUIRES(_mutex);
     void filenameWithSuffix(Pathname& out, unsigned suffix) const;
 
-    FileDescriptor _fd;
+    Mutex _mutex;  // from the identity check to the rotation
+    FileDescriptor _fd KORVEX_GUARDED_BY(_mutex);
     Pathname _filename;                 // empty: no file, only the descriptor
     std::int64_t _maxSize = 0;          // bytes; 0: never rotate
-    std::int64_t _curSize = 0;          // bytes in the file, as far as known
     std::uint32_t _maxBackupIndex = 0;  // number of backups kept
     const LogFormat* _fmt = nullptr;    // not owned; layouts are shared and never freed
-    Mutex _mutex;                       // from the identity check to the rotation
-    ino_t _inodeNum = 0;                // identity of the open file ...
-    dev_t _device = 0;                  // ... an inode number alone is unique on one device only
-    long long _lastCheck = 0;           // seconds: when that identity was confirmed
+    // Bytes in the file, as far as known.
+    std::int64_t _curSize KORVEX_GUARDED_BY(_mutex) = 0;
+    // Identity of the open file: an inode number alone is unique on one device only.
+    ino_t _inodeNum KORVEX_GUARDED_BY(_mutex) = 0;
+    dev_t _device KORVEX_GUARDED_BY(_mutex) = 0;
+    // Seconds: when that identity was confirmed.
+    long long _lastCheck KORVEX_GUARDED_BY(_mutex) = 0;
 };
 
 }  // namespace korvex

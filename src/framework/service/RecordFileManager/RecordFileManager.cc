@@ -6,6 +6,9 @@
 #include "framework/service/RecordFileManager/RecordFormat.h"
 #include "framework/service/RecordFileManager/StoreLogger.h"
 #include "framework/service/RecordFileManager/ValueBlock.h"
+#include "util/Logger/LoggingLocks.h"
+
+#include <pthread.h>
 
 #include <algorithm>
 #include <cstring>
@@ -37,8 +40,21 @@ Block newValueBlock(std::size_t size) {
 }
 
 RecordFileManager* RecordFileManager::instance() {
-    if (__pInstance == nullptr) __pInstance = new RecordFileManager;
+    if (__pInstance == nullptr) {
+        __pInstance = new RecordFileManager;
+        keepLockThroughForks();
+    }
     return __pInstance;
+}
+
+// A child of fork(2) would find the lock as another thread held it, and nobody to free it. The
+// logging system's locks may be taken under this one, so before a fork this one must come first:
+// what pthread_atfork(3) is told last runs first then.
+void RecordFileManager::keepLockThroughForks() KORVEX_NO_THREAD_SAFETY_ANALYSIS {
+    LoggingLocks::keepThroughForks();
+    const auto take = []() KORVEX_NO_THREAD_SAFETY_ANALYSIS { __pInstance->_mutex.NOLOG_lock(); };
+    const auto free = []() KORVEX_NO_THREAD_SAFETY_ANALYSIS { __pInstance->_mutex.NOLOG_unlock(); };
+    static_cast<void>(pthread_atfork(take, free, free));
 }
 
 RecordFileManager::~RecordFileManager() noexcept(false) = default;

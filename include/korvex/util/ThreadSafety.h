@@ -1,0 +1,25 @@
+#pragma once
+
+// Words for clang's thread-safety analysis (-Wthread-safety): which lock guards what, and what
+// takes and frees it. Other compilers read nothing. Source:
+// https://clang.llvm.org/docs/ThreadSafetyAnalysis.html
+#if defined(__clang__)
+#define KORVEX_THREAD_SAFETY(attribute) __attribute__((attribute))
+#else
+#define KORVEX_THREAD_SAFETY(attribute)
+#endif
+
+// A class whose objects are locks, and one whose objects hold a lock for a scope.
+#define KORVEX_CAPABILITY(name) KORVEX_THREAD_SAFETY(capability(name))
+#define KORVEX_SCOPED_CAPABILITY KORVEX_THREAD_SAFETY(scoped_lockable)
+// A variable that is touched only while the lock is held, and a function that is called so.
+#define KORVEX_GUARDED_BY(lock) KORVEX_THREAD_SAFETY(guarded_by(lock))
+#define KORVEX_REQUIRES(...) KORVEX_THREAD_SAFETY(requires_capability(__VA_ARGS__))
+// A function that is called while the lock is not held, because it takes it itself.
+#define KORVEX_EXCLUDES(...) KORVEX_THREAD_SAFETY(locks_excluded(__VA_ARGS__))
+// What takes and what frees a lock.
+#define KORVEX_ACQUIRE(...) KORVEX_THREAD_SAFETY(acquire_capability(__VA_ARGS__))
+#define KORVEX_TRY_ACQUIRE(...) KORVEX_THREAD_SAFETY(try_acquire_capability(__VA_ARGS__))
+#define KORVEX_RELEASE(...) KORVEX_THREAD_SAFETY(release_capability(__VA_ARGS__))
+// A function that the analysis cannot follow; a comment beside it says why it is right.
+#define KORVEX_NO_THREAD_SAFETY_ANALYSIS KORVEX_THREAD_SAFETY(no_thread_safety_analysis)
