@@ -11,6 +11,7 @@
 #include <algorithm>
 #include <atomic>
 #include <cerrno>
+#include <csignal>
 #include <cstdarg>
 #include <cstddef>
 #include <cstdio>
@@ -23,6 +24,7 @@ namespace testsupport {
 namespace {
 
 constexpr unsigned long kNever = 0;
+constexpr int kKill = -1;  // no errno
 constexpr unsigned long kUnlimited = static_cast<unsigned long>(-1);
 
 struct Plan {
@@ -51,6 +53,7 @@ Verdict judge(Call call) {
     const unsigned long nth = ++plan.calls;
     const unsigned long at = plan.failAt;
     if (at == kNever || nth < at || (nth > at && !plan.persistent)) return {};
+    if (plan.error == kKill) kill(getpid(), SIGKILL);
     return {plan.error, plan.limit};
 }
 
@@ -135,6 +138,13 @@ FailNth::FailNth(Call call, unsigned long k, int error, Persistence persistence)
 
 bool FailNth::fired() const {
     return count() >= planOf(_call).failAt;
+}
+
+KillAtNth::KillAtNth(Call call, unsigned long k) : CountCalls(call) {
+    Plan& plan = planOf(call);
+    plan.error = kKill;
+    plan.persistent = false;
+    plan.failAt = k;
 }
 
 ShortNth::ShortNth(Call call, unsigned long k, unsigned long count) : CountCalls(call) {

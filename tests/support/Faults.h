@@ -77,6 +77,12 @@ class FailNth : public CountCalls {
     bool fired() const;
 };
 
+// Kills the process by SIGKILL at the k-th call, before it is made.
+class KillAtNth : public CountCalls {
+  public:
+    KillAtNth(Call call, unsigned long k);
+};
+
 // Lets the k-th read, write, fread or fwrite move `count` bytes at the most.
 class ShortNth : public CountCalls {
   public:

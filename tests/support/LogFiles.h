@@ -5,7 +5,8 @@
 
 namespace testsupport {
 
-// Every line of a log file and its backups, oldest first. A last line without a newline counts.
+// Every line of a log file and its numbered backups, oldest first. A last line without a newline
+// counts.
 std::vector<std::string> linesOf(const std::string& logFile);
 
 }  // namespace testsupport
