@@ -35,22 +35,48 @@ class SafetyTest : public RecordsToolTest {
     }
 };
 
-TEST_F(SafetyTest, AKillAtAnyMomentLeavesTheOldFileOrTheNewOne) {
-    const std::string before = fileOf({{"a", "1"}});
-    const std::string after = fileOf({{"a", "1"}, {"b", std::string(9000, 'x')}});
+struct Writing {
+    const char* name;
+    std::vector<std::string> arguments;
+    std::vector<std::pair<std::string, std::string>> after;
+};
+
+class KilledWriting : public SafetyTest, public testing::WithParamInterface<Writing> {};
+
+TEST_P(KilledWriting, LeavesTheOldFileOrTheNewOneAndTheNextRunFindsIt) {
+    const std::string before = fileOf({{"a", "1"}, {"c", "3"}});
+    const std::string after = fileOf(GetParam().after);
+    writeFile(dir.file("dump"), "VERSION=3\nHEADER=END\n 62\n 32\nDATA=END\n");
+    std::vector<std::string> arguments = GetParam().arguments;
+    if (arguments[0] == "load") arguments.push_back(dir.file("dump"));
     bool ended = false;
     bool sawAfter = false;
-    for (int k = 0; !ended; ++k) {
+    int k = 0;
+    for (; !ended; ++k) {
         writeFile(data, before);
-        ended = runUntilStop(k, {"put", "b", std::string(9000, 'x')});
+        ended = runUntilStop(k, arguments);
         const std::string left = stored();
         sawAfter = sawAfter || (!ended && left == after);
         ASSERT_TRUE(left == before || left == after) << "killed at stop " << k;
+        if (k % 16 == 0) {
+            ASSERT_EQ(run({"check"}).status, 0) << "killed at stop " << k;
+        }
+        ASSERT_TRUE(stored() == left);
     }
+    std::printf("[  killed  ] %s: %d times\n", GetParam().name, k - 1);
     EXPECT_TRUE(sawAfter);
     EXPECT_TRUE(stored() == after);
     EXPECT_THAT(beside(), ElementsAre("data", "data.lock")) << "the run that ended tidies up";
 }
+
+INSTANTIATE_TEST_SUITE_P(
+    SafetyTest, KilledWriting,
+    testing::Values(Writing{"put",
+                            {"put", "b", std::string(9000, 'x')},
+                            {{"a", "1"}, {"b", std::string(9000, 'x')}, {"c", "3"}}},
+                    Writing{"remove", {"remove", "a", "c"}, {}},
+                    Writing{"load", {"load"}, {{"a", "1"}, {"b", "2"}, {"c", "3"}}}),
+    [](const auto& writing) { return std::string(writing.param.name); });
 
 TEST_F(SafetyTest, TheCopyOfAKilledRunDoesNotReplaceAWholeFile) {
     const std::string newer = fileOf({{"a", "1"}, {"b", "2"}});
