@@ -1,0 +1,37 @@
+#!/bin/sh
+# Runs the whole suite with clang's counters and prints the line, branch and MC/DC coverage of src/.
+# Usage: coverage.sh [JOBS]
+set -eu
+cd "$(dirname "$0")/.."
+jobs=${1:-2}
+build=$PWD/build/coverage
+
+flags="-O0 -g0 -fprofile-instr-generate -fcoverage-mapping"
+suffix=-19
+if command -v clang++-19 > /dev/null; then
+    flags="$flags -fcoverage-mcdc"
+else
+    echo "coverage: there is no clang-19, so there is no MC/DC" >&2
+    suffix=
+fi
+
+mkdir -p "$build"
+"clang++$suffix" -c -O1 scripts/coverage-profile.cc -o "$build/profile.o"
+cmake -S . -B "$build" -G Ninja -DCMAKE_BUILD_TYPE=None -DCMAKE_CXX_COMPILER="clang++$suffix" \
+    -DCMAKE_CXX_FLAGS="$flags" -DCMAKE_EXE_LINKER_FLAGS="$build/profile.o" > /dev/null
+cmake --build "$build" -j "$jobs"
+
+# %m: each program has one file, and every process of it adds to that, forked children too. The
+# checks of sources and package run nothing of this build.
+tests=$build/tests/korvex-tests
+tool=$build/tools/korvex-records/korvex-records
+rm -rf "$build/profiles"
+LLVM_PROFILE_FILE="$build/profiles/%m.profraw" \
+    ctest --test-dir "$build" -j "$jobs" --output-on-failure --exclude-regex '^(Check|Stranger)\.'
+
+# A function that only one of the programs uses has no counters in the other, of which llvm-cov
+# warns.
+"llvm-profdata$suffix" merge -o "$build/all.profdata" "$build"/profiles/*.profraw
+"llvm-cov$suffix" export -instr-profile "$build/all.profdata" "$tests" -object "$tool" \
+    > "$build/coverage.json" 2> "$build/llvm-cov.log" || { cat "$build/llvm-cov.log" >&2; exit 1; }
+python3 scripts/coverage-report.py . tests/coverage-exempt.txt "$build/coverage.json"
