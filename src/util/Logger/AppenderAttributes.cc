@@ -1,6 +1,7 @@
 #include <korvex/util/Logger.h>
 
 #include "base/NeverDestroyed.h"
+#include "util/Logger/AppenderRegistry.h"
 #include "util/Logger/AppenderReport.h"
 #include "util/Logger/RootObjects.h"
 
@@ -9,11 +10,14 @@
 #include <algorithm>
 #include <cstdlib>
 #include <limits>
-#include <memory>
 #include <string_view>
-#include <vector>
 
 inline namespace korvex {
+
+LayoutList& layouts() {
+    static NeverDestroyed<LayoutList> instance;
+    return *instance;
+}
 
 namespace {
 
@@ -26,11 +30,9 @@ Pathname expandHome(std::string_view val, const Pathname& korvexHome) {
     return Pathname(korvexHome + std::string(val.substr(shome.size())));
 }
 
-// Layouts are shared with threads that may be writing, so one that was replaced stays.
 const LogFormat* makeLayout(const char* pattern) {
-    static NeverDestroyed<std::vector<std::unique_ptr<const LogFormat>>> layouts;
-    (*layouts).push_back(std::make_unique<const LogFormat>(pattern));
-    return (*layouts).back().get();
+    layouts().push_back(std::make_unique<const LogFormat>(pattern));
+    return layouts().back().get();
 }
 
 // The layout of that name; null for "PatternLayout", whose pattern is an attribute of its own.
