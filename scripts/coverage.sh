@@ -6,7 +6,7 @@ cd "$(dirname "$0")/.."
 jobs=${1:-2}
 build=$PWD/build/coverage
 
-flags="-O0 -g0 -fprofile-instr-generate -fcoverage-mapping"
+flags="-O0 -g0 -fprofile-instr-generate -fcoverage-mapping -fprofile-update=atomic"
 suffix=-19
 if command -v clang++-19 > /dev/null; then
     flags="$flags -fcoverage-mcdc"
@@ -21,17 +21,23 @@ cmake -S . -B "$build" -G Ninja -DCMAKE_BUILD_TYPE=None -DCMAKE_CXX_COMPILER="cl
     -DCMAKE_CXX_FLAGS="$flags" -DCMAKE_EXE_LINKER_FLAGS="$build/profile.o" > /dev/null
 cmake --build "$build" -j "$jobs"
 
-# %m: each program has one file, and every process of it adds to that, forked children too. The
-# checks of sources and package run nothing of this build.
+# One file of counters for each process that was not forked: its forked children add to it (%m),
+# those that have become another user too. The checks of sources and package run nothing of this
+# build.
 tests=$build/tests/korvex-tests
 tool=$build/tools/korvex-records/korvex-records
-rm -rf "$build/profiles"
-LLVM_PROFILE_FILE="$build/profiles/%m.profraw" \
-    ctest --test-dir "$build" -j "$jobs" --output-on-failure --exclude-regex '^(Check|Stranger)\.'
+profiles=$(mktemp -d)
+trap 'rm -rf "$profiles"' EXIT
+chmod a+rwx "$profiles"
+export LLVM_PROFILE_FILE="$profiles/%m-%p.profraw"
+ctest --test-dir "$build" -j "$jobs" --output-on-failure --progress \
+    --exclude-regex '^(Check|Stranger)\.'
 
+# A tool that was killed while it wrote its counters leaves a file that cannot be read.
+"llvm-profdata$suffix" merge -failure-mode=all -o "$build/all.profdata" "$profiles" \
+    2> "$build/unreadable.log"
 # A function that only one of the programs uses has no counters in the other, of which llvm-cov
 # warns.
-"llvm-profdata$suffix" merge -o "$build/all.profdata" "$build"/profiles/*.profraw
 "llvm-cov$suffix" export -instr-profile "$build/all.profdata" "$tests" -object "$tool" \
     > "$build/coverage.json" 2> "$build/llvm-cov.log" || { cat "$build/llvm-cov.log" >&2; exit 1; }
 python3 scripts/coverage-report.py . tests/coverage-exempt.txt "$build/coverage.json"

@@ -1,6 +1,7 @@
 #include "support/Faults.h"
 
 #include <fcntl.h>
+#include <popt.h>
 #include <pthread.h>
 #include <sys/stat.h>
 #include <sys/time.h>
@@ -34,6 +35,7 @@ struct Plan {
     std::atomic<bool> persistent{false};
     std::atomic<int> error{0};  // 0 with failAt set: a short count instead of a failure
     std::atomic<unsigned long> limit{kUnlimited};
+    std::atomic<long> shift{0};
 };
 
 Plan plans[static_cast<std::size_t>(Call::COUNT)];
@@ -45,6 +47,7 @@ Plan& planOf(Call call) {
 struct Verdict {
     int error = 0;
     unsigned long limit = kUnlimited;
+    long shift = 0;
 };
 
 Verdict judge(Call call) {
@@ -54,7 +57,7 @@ Verdict judge(Call call) {
     const unsigned long at = plan.failAt;
     if (at == kNever || nth < at || (nth > at && !plan.persistent)) return {};
     if (plan.error == kKill) kill(getpid(), SIGKILL);
-    return {plan.error, plan.limit};
+    return {plan.error, plan.limit, plan.shift};
 }
 
 bool fails(Call call) {
@@ -107,6 +110,7 @@ const char* nameOf(Call call) {
         "pthread_cond_clockwait",
         "pthread_key_create",
         "pthread_setspecific",
+        "poptGetContext",
     };
     static_assert(std::size(names) == static_cast<std::size_t>(Call::COUNT));
     return names[static_cast<std::size_t>(call)];
@@ -116,6 +120,7 @@ CountCalls::CountCalls(Call call) : _call(call) {
     Plan& plan = planOf(call);
     plan.calls = 0;
     plan.failAt = kNever;
+    plan.shift = 0;
     plan.active = true;
 }
 
@@ -156,6 +161,19 @@ ShortNth::ShortNth(Call call, unsigned long k, unsigned long count) : CountCalls
 }
 
 bool ShortNth::fired() const {
+    return count() >= planOf(_call).failAt;
+}
+
+ShiftNth::ShiftNth(Call call, unsigned long k, long by) : CountCalls(call) {
+    Plan& plan = planOf(call);
+    plan.error = 0;
+    plan.limit = kUnlimited;
+    plan.shift = by;
+    plan.persistent = false;
+    plan.failAt = k;
+}
+
+bool ShiftNth::fired() const {
     return count() >= planOf(_call).failAt;
 }
 
@@ -271,9 +289,32 @@ int __wrap_pthread_join(pthread_t thread, void** result) {
     return error != 0 ? error : joined;
 }
 
+int __real_stat(const char* path, struct stat* st);
+int __wrap_stat(const char* path, struct stat* st) {
+    const auto verdict = judge(Call::stat);
+    if (verdict.error != 0) {
+        errno = verdict.error;
+        return -1;
+    }
+    const int result = __real_stat(path, st);
+    st->st_dev += static_cast<dev_t>(verdict.shift);
+    return result;
+}
+
+int __real_gettimeofday(struct timeval* tv, void* zone);
+int __wrap_gettimeofday(struct timeval* tv, void* zone) {
+    const auto verdict = judge(Call::gettimeofday);
+    if (verdict.error != 0) {
+        errno = verdict.error;
+        return -1;
+    }
+    const int result = __real_gettimeofday(tv, zone);
+    tv->tv_sec += static_cast<time_t>(verdict.shift);
+    return result;
+}
+
 FORWARD(-1, ssize_t, writev, (int fd, const struct iovec* vec, int n), (fd, vec, n))
 FORWARD(-1, int, fstat, (int fd, struct stat* st), (fd, st))
-FORWARD(-1, int, stat, (const char* path, struct stat* st), (path, st))
 FORWARD(-1, int, access, (const char* path, int mode), (path, mode))
 FORWARD(-1, off_t, lseek, (int fd, off_t off, int whence), (fd, off, whence))
 FORWARD(-1, int, fsync, (int fd), (fd))
@@ -281,7 +322,6 @@ FORWARD(-1, int, rename, (const char* from, const char* to), (from, to))
 FORWARD(-1, int, unlink, (const char* path), (path))
 FORWARD(nullptr, FILE*, fopen, (const char* path, const char* mode), (path, mode))
 FORWARD(nullptr, void*, calloc, (size_t n, size_t size), (n, size))
-FORWARD(-1, int, gettimeofday, (struct timeval * tv, void* zone), (tv, zone))
 FORWARD(nullptr, struct tm*, localtime_r, (const time_t* t, struct tm* out), (t, out))
 FORWARD(0, size_t, strftime, (char* buf, size_t n, const char* fmt, const struct tm* tm),
         (buf, n, fmt, tm))
@@ -315,6 +355,10 @@ FORWARD_NUMBER(Call::pthread_key_create, pthread_key_create,
                (pthread_key_t * key, void (*cleanup)(void*)), (key, cleanup))
 FORWARD_NUMBER(Call::pthread_setspecific, pthread_setspecific,
                (pthread_key_t key, const void* value), (key, value))
+FORWARD(nullptr, poptContext, poptGetContext,
+        (const char* name, int argc, const char** argv, const struct poptOption* options,
+         unsigned int flags),
+        (name, argc, argv, options, flags))
 
 }  // extern "C"
 

@@ -46,6 +46,7 @@ enum class Call {
     pthread_cond_clockwait,
     pthread_key_create,
     pthread_setspecific,
+    poptGetContext,
     COUNT
 };
 
@@ -87,6 +88,15 @@ class KillAtNth : public CountCalls {
 class ShortNth : public CountCalls {
   public:
     ShortNth(Call call, unsigned long k, unsigned long count);
+
+    bool fired() const;
+};
+
+// Lets the k-th stat tell of a device whose number is `by` larger, or the k-th gettimeofday of a
+// moment that many seconds later.
+class ShiftNth : public CountCalls {
+  public:
+    ShiftNth(Call call, unsigned long k, long by);
 
     bool fired() const;
 };

@@ -6,4 +6,4 @@ set(KORVEX_WRAPPED_CALLS
   pthread_create pthread_join pthread_attr_init pthread_attr_setstacksize
   pthread_mutex_init pthread_mutex_destroy pthread_mutex_lock pthread_mutex_unlock
   pthread_mutex_trylock pthread_cond_init pthread_cond_wait pthread_cond_clockwait
-  pthread_key_create pthread_setspecific)
+  pthread_key_create pthread_setspecific poptGetContext)

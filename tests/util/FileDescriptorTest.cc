@@ -20,6 +20,7 @@ using testsupport::Call;
 using testsupport::CountCalls;
 using testsupport::FailNth;
 using testsupport::readFile;
+using testsupport::ShiftNth;
 using testsupport::ShortNth;
 using testsupport::TempDir;
 using testsupport::writeFile;
@@ -247,6 +248,18 @@ TEST_F(FileDescriptorTest, AConversionThatFailsWritesNothing) {
     fd.close();
 }
 
+TEST_F(FileDescriptorTest, ALongTextThatFindsNoMemoryWritesNothing) {
+    FileDescriptor fd = path("f").openCreateOnly(Pathname::CREATE_NORMAL);
+    const std::string text(1000, 'x');
+    const CountCalls writes(Call::write);
+    const FailNth fault(Call::new_array, 1, ENOMEM);
+    errno = 0;
+    fd.format("%s", text.c_str());
+    EXPECT_EQ(errno, ENOMEM);
+    EXPECT_EQ(writes.count(), 0U);
+    fd.close();
+}
+
 TEST_F(FileDescriptorTest, CloseOnExecIsSetOnceAndCleared) {
     FileDescriptor fd = path("f").openCreateOnly(Pathname::CREATE_NORMAL);
     const CountCalls calls(Call::fcntl);
@@ -396,6 +409,14 @@ TEST_F(FileDescriptorTest, ACopyOntoItselfIsRefused) {
         EXPECT_FALSE(path("f").copyTo(path(name))) << name;
     }
     EXPECT_EQ(readFile(path("f")), "precious");
+}
+
+TEST_F(FileDescriptorTest, TheSameNumberOnAnotherDeviceIsAnotherFile) {
+    writeFile(path("f"), "content");
+    const ShiftNth elsewhere(Call::stat, 1, 1);
+    EXPECT_TRUE(path("f").copyTo(path("f"))) << "taken for two files";
+    EXPECT_TRUE(elsewhere.fired());
+    EXPECT_EQ(readFile(path("f")), "") << "it was emptied before it was read";
 }
 
 TEST_F(FileDescriptorTest, ACopyThatFailsTellsWhyAndLeaksNothing) {

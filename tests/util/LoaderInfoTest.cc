@@ -4,9 +4,11 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
+#include <cerrno>
 #include <cstdlib>
 #include <ctime>
 #include <functional>
+#include <new>
 #include <string>
 #include <vector>
 
@@ -21,6 +23,7 @@ using testing::Not;
 using testsupport::Call;
 using testsupport::ChildResult;
 using testsupport::CountCalls;
+using testsupport::FailNth;
 using testsupport::runInChild;
 using testsupport::TempDir;
 using testsupport::writeFile;
@@ -283,9 +286,15 @@ TEST_F(ValidateTest, TheFirstFailureCounts) {
 }
 
 TEST_F(ValidateTest, AHomeThatIsAFileIsFoundWhereItsPathsExist) {
-    // Below a file nothing exists, so -10 needs a home that changes between two looks; what can be
-    // seen is that the paths' existence comes first.
-    EXPECT_EQ(validate(_dir.file("file"), _dir.file("db"), {"-c", "/", "-i", "/"}), -9);
+    const std::string file = _dir.file("file");
+    const std::string db = _dir.file("db");
+    EXPECT_EQ(validate(file, db, {"-c", "/", "-i", "/"}), -9) << "below a file nothing exists";
+    EXPECT_EQ(validate(file, db, {"-c", "", "-i", ""}), -10) << "the paths are the home";
+}
+
+TEST_F(ValidateTest, AConfigPathThatIsAFileIsToldWithoutAnInstallName) {
+    writeFile(_dir.file("home/plain"), "");
+    EXPECT_EQ(validate(_dir.file("home"), _dir.file("db"), {"-c", "plain", "-i", ""}), -12);
 }
 
 TEST(ErrorMessageTest, EachCodeHasItsText) {
@@ -367,6 +376,27 @@ TEST_F(EnvironmentTest, EqualityLooksAtAllButTheNode) {
     LoaderInfo d(a);
     d.populateFromEnvironment();
     EXPECT_FALSE(a == d);
+}
+
+TEST_F(EnvironmentTest, EqualityLooksAtTheProcess) {
+    const Parsed parent({});
+    const auto result = runInChild([&] {
+        const Parsed child({});
+        return parent == child ? 1 : 0;
+    });
+    EXPECT_EQ(result.status, 0);
+}
+
+TEST_F(EnvironmentTest, EqualityLooksAtTheStart) {
+    const Parsed first({});
+    while (time(nullptr) == first.getStartupTime())
+        usleep(10000);
+    EXPECT_FALSE(first == Parsed({}));
+}
+
+TEST(LoaderInfoTest, AParserThatCannotBeMadeIsNoMemory) {
+    const FailNth fault(Call::poptGetContext, 1, ENOMEM);
+    EXPECT_THROW(Parsed({}), std::bad_alloc);
 }
 
 TEST(LoaderInfoTest, TheNodeIsStoredAsACopyAndHandedOutItself) {

@@ -539,6 +539,36 @@ TEST_F(FileSystemTest, DirectoriesAreListedWithoutTheDots) {
     EXPECT_EQ(errno, EBADF);
 }
 
+TEST_F(FileSystemTest, ADirectoryMovesFromOneObjectToAnother) {
+    writeFile(path("a"), "");
+    DirectoryDescriptor first = Pathname(_dir.path()).opendir();
+    DirectoryDescriptor second(std::move(first));
+    DirectoryEntry entry;
+    EXPECT_TRUE(second.next(entry));
+    DirectoryDescriptor third = path("missing").opendir();
+    ASSERT_FALSE(third.valid());
+    third = std::move(second);
+    EXPECT_TRUE(third.valid());
+    EXPECT_FALSE(third.next(entry)) << "it goes on where the other stood";
+}
+
+TEST_F(FileSystemTest, ADirectoryThatFailsUnderTheReaderTellsWhy) {
+    const int number = dup(0);
+    close(number);
+    DirectoryDescriptor dir = Pathname(_dir.path()).opendir();
+    ASSERT_TRUE(dir.valid());
+    ASSERT_EQ(close(number), 0) << "the directory's own";
+    DirectoryEntry entry;
+    errno = 0;
+    EXPECT_FALSE(dir.next(entry));
+    EXPECT_EQ(errno, EBADF);
+    errno = 0;
+    EXPECT_FALSE(dir.close());
+    EXPECT_EQ(errno, EBADF);
+    EXPECT_FALSE(dir.valid());
+    EXPECT_TRUE(dir.close()) << "there is nothing left to close";
+}
+
 TEST_F(FileSystemTest, AMissingDirectoryIsNotValid) {
     errno = 0;
     EXPECT_FALSE(path("missing").opendir().valid());

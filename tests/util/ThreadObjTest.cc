@@ -192,6 +192,23 @@ TEST(RecursiveMutexTest, AWaiterGetsItAfterTheLastUnlock) {
     mutex.unlock();
 }
 
+// Another thread let go of it between the two looks.
+TEST(RecursiveMutexTest, ALockThatIsBusyWithoutAnOwnerIsWaitedFor) {
+    RecursiveMutex mutex;
+    {
+        const FailNth busy(Call::pthread_mutex_trylock, 1, EBUSY);
+        EXPECT_FALSE(mutex.tryLock());
+    }
+    {
+        const FailNth busy(Call::pthread_mutex_trylock, 1, EBUSY);
+        mutex.lock();
+        EXPECT_TRUE(busy.fired());
+    }
+    EXPECT_TRUE(mutex.tryLock()) << "it is ours";
+    mutex.unlock();
+    mutex.unlock();
+}
+
 TEST(RecursiveMutexTest, UnlockingWhatNobodyHoldsIsAnAssertion) {
     const ChildResult result = runInChild([] {
         RecursiveMutex mutex;
@@ -285,6 +302,32 @@ TEST(ConditionTest, AWaiterIsWoken) {
     }
     a.join();
     b.join();
+}
+
+struct ConditionWakeOne : ConditionBaseClass {
+    void wake_one() { internal_wake_one(); }
+};
+
+TEST(ConditionTest, OneWaiterIsWokenForEachCall) {
+    Mutex mutex;
+    ConditionWakeOne cond;
+    int ready = 0;
+    const auto wait = [&] {
+        ScopedMutex lock(mutex);
+        while (ready == 0)
+            cond.wait(lock);
+        --ready;
+    };
+    std::thread a(wait);
+    std::thread b(wait);
+    for (int i = 0; i < 2; ++i) {
+        const ScopedMutex lock(mutex);
+        ++ready;
+        cond.wake_one();
+    }
+    a.join();
+    b.join();
+    EXPECT_EQ(ready, 0);
 }
 
 TEST(ConditionTest, ATimedWaitEndsWithFalse) {

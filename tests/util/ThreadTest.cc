@@ -14,6 +14,7 @@
 
 #include "support/Child.h"
 #include "support/Faults.h"
+#include "util/Thread/ActiveThreads.h"
 
 // There is one main-thread object a process, so each test makes its own in a child.
 
@@ -121,6 +122,29 @@ TEST(ThreadTest, NothingRunsBeforeGo) {
                   return !early && ran;
               }).status,
               0);
+}
+
+TEST(ThreadTest, AThreadWithoutWorkOfItsOwnEndsAtOnce) {
+    EXPECT_EQ(child([] {
+                  const Thread mainThread;
+                  Thread idle("idle");
+                  idle.go();
+                  idle.join();
+                  return true;
+              }).status,
+              0);
+}
+
+TEST(ThreadTest, RegisteringAThreadTwiceIsAnAssertion) {
+    const ChildResult result = child([] {
+        const Thread mainThread;
+        Worker worker("w", [] { ActiveThreads::add(Thread::current()); });
+        worker.go();
+        worker.join();
+        return true;
+    });
+    EXPECT_EQ(result.signal, SIGABRT);
+    EXPECT_THAT(result.err, MatchesRegex(assertion("_ptrs->get\\(\\) == NULL")));
 }
 
 TEST(ThreadTest, GoTwiceIsAnAssertion) {

@@ -17,6 +17,7 @@ namespace {
 using testsupport::Call;
 using testsupport::FailNth;
 using testsupport::runInChild;
+using testsupport::ShiftNth;
 
 Timeval at(int sec, int usec) {
     Timeval t;
@@ -49,6 +50,19 @@ TEST(TimevalTest, NowLiesBetweenTwoReadingsOfTheClock) {
     EXPECT_LE(before, now.sec());
     EXPECT_TRUE(now <= current);
     EXPECT_LE(current.sec(), std::time(nullptr) + 1);
+}
+
+TEST(TimevalTest, AClockBeyondTheRangeReadsAsItsNearestEnd) {
+    if (sizeof(time_t) < 8) GTEST_SKIP() << "no clock can show it with a time_t of 32 bits";
+    const auto shifted = [](long by) {
+        const ShiftNth fault(Call::gettimeofday, 1, by);
+        return Timeval::now();
+    };
+    EXPECT_TRUE(same(shifted(INT_MAX), kMax));
+    EXPECT_EQ(shifted(-2L * INT_MAX - INT_MAX).sec(), INT_MIN);
+    const long left = INT_MAX - std::time(nullptr);
+    EXPECT_GT(shifted(left - 3600).sec(), INT_MAX - 3700);
+    EXPECT_LT(shifted(left - 3600).sec(), INT_MAX);
 }
 
 TEST(TimevalTest, ACurrentTimevalCanBeSet) {

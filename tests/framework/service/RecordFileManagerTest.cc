@@ -542,6 +542,20 @@ TEST_F(RecordFileManagerTest, PreloadMergesTheMatchingRecordsOfAnotherFile) {
     EXPECT_EQ(readFile(_file), "") << "nothing is saved";
 }
 
+TEST_F(RecordFileManagerTest, DestroyingAStoreWhoseLockFailsThrows) {
+    run([] {
+        const FailNth fault(Call::pthread_mutex_destroy, 1, EBUSY);
+        try {
+            delete RecordFileManager::instance();
+        } catch (const PthreadException& e) {
+            fputs(e.what(), stdout);
+        }
+    });
+    EXPECT_EQ(_out,
+              "Main Thread: about to throw a PthreadException: pthread_mutex_destroy: Device or "
+              "resource busy");
+}
+
 TEST_F(RecordFileManagerTest, ManyThreadsMayPut) {
     run([] {
         std::vector<std::thread> threads;

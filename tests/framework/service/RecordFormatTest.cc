@@ -16,4 +16,12 @@ TEST(RecordFormatTest, LengthsAreLittleEndianBytes) {
     EXPECT_EQ(getLength(bytes), 0xfffefdfcU);
 }
 
+TEST(RecordFormatTest, AVersionKeyIsToldByItsBeginningInAnyCase) {
+    EXPECT_TRUE(isVersionKey("_record-file-version"));
+    EXPECT_TRUE(isVersionKey("_RECORD-file-Version.old"));
+    EXPECT_FALSE(isVersionKey("_record-file-versio"));
+    EXPECT_FALSE(isVersionKey("_record-file-versiom"));
+    EXPECT_FALSE(isVersionKey("a key that is longer than the version's"));
+}
+
 }  // namespace

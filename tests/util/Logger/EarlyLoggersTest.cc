@@ -16,6 +16,7 @@
 
 #include "support/Child.h"
 #include "support/Faults.h"
+#include "util/Logger/EarlyLoggers.h"
 
 // What loggers do before Logger::initialize, when it binds them, and beyond main. Each test runs in
 // a process of its own, because initialisation happens once.
@@ -198,6 +199,55 @@ TEST(EarlyLoggersTest, ALoggerThatIsGoneIsNotBound) {
                   Logger::initialize();
               }),
               "one\nthree\nstill one\n");
+}
+
+TEST(EarlyLoggersTest, ACopyIsNotOnTheListAndMayGo) {
+    EXPECT_EQ(errOf([] {
+                  Logger logger("a");
+                  { const Logger copy(logger); }
+                  logger.info("still early");
+                  Logger::initialize();
+                  logger.info("bound");
+              }),
+              "still early\nbound\n");
+}
+
+// What happens to a thread that builds a logger, or logs, while another one initialises.
+TEST(EarlyLoggersTest, ALoggerThatComesToTheListTooLateIsBoundAtOnce) {
+    EXPECT_EQ(errOf([] {
+                  Logger late("a");
+                  EarlyLoggers::remove(late);
+                  Logger::setChannelLevel("a", "DEBUG");
+                  Logger::initialize();
+                  late.debug("dropped");
+                  EarlyLoggers::add(late);
+                  late.debug("bound");
+                  if (EarlyLoggers::isUnusable(late)) late.debug("unusable");
+              }),
+              "bound\n");
+}
+
+TEST(EarlyLoggersTest, TextsBelowTheLevelAreDropped) {
+    EXPECT_EQ(errOf([] {
+                  Logger logger("a");
+                  logger.debug(std::string("early"));
+                  Logger::initialize();
+                  logger.debug(std::string("late"));
+                  logger.info(std::string("shown"));
+              }),
+              "shown\n");
+}
+
+TEST(EarlyLoggersTest, ALoggerMayBeAssignedToItself) {
+    EXPECT_EQ(errOf([] {
+                  Logger logger("a");
+                  Logger& self = logger;
+                  logger = self;
+                  Logger::initialize();
+                  logger = self;
+                  logger.info("x");
+              }),
+              "x\n");
 }
 
 TEST(EarlyLoggersTest, InitialisingTwiceIsAnAssertion) {

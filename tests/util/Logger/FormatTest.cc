@@ -36,6 +36,11 @@ TEST(FormatTest, ADoubledPercentSignBeforeMIsNoConversion) {
     EXPECT_EQ(formatted(2, "%%%%m %m"), "%%m No such file or directory");
 }
 
+TEST(FormatTest, APercentSignAtTheEndStaysWithTheErrorText) {
+    // printf leaves it open what an unfinished conversion gives: glibc refuses the format.
+    EXPECT_EQ(formatted(ENOENT, "%m%"), "No such file or directory%");
+}
+
 TEST(FormatTest, AnErrorNumberWithoutATextIsUnknown) {
     EXPECT_EQ(formatted(99999, "%m"), "UNKNOWN ERROR");
     EXPECT_EQ(formatted(-1, "%m"), "UNKNOWN ERROR");

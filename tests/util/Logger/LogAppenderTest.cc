@@ -28,6 +28,7 @@ using testsupport::CountCalls;
 using testsupport::FailNth;
 using testsupport::readFile;
 using testsupport::runInChild;
+using testsupport::ShiftNth;
 using testsupport::ShortNth;
 using testsupport::TempDir;
 using testsupport::writeFile;
@@ -399,6 +400,17 @@ TEST_F(LogAppenderTest, AReplacedFileIsNoticed) {
     ASSERT_EQ(rename(_dir.file("other").c_str(), _file.c_str()), 0);
     log("two", 1006);
     EXPECT_EQ(content(), "other\ntwo\n");
+}
+
+TEST_F(LogAppenderTest, TheSameFileNumberOnAnotherDeviceIsAnotherFile) {
+    set("fileName", _file);
+    log("one", 1000);
+    const ShiftNth elsewhere(Call::stat, 1, 1);
+    const CountCalls opens(Call::open);
+    log("two", 1006);
+    EXPECT_TRUE(elsewhere.fired());
+    EXPECT_EQ(opens.count(), 1U);
+    EXPECT_EQ(content(), "one\ntwo\n");
 }
 
 TEST_F(LogAppenderTest, AClockSetBackForcesACheck) {

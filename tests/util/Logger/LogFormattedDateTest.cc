@@ -6,6 +6,7 @@
 #include <cstdlib>
 #include <cstring>
 #include <ctime>
+#include <new>
 #include <stdexcept>
 #include <string>
 
@@ -156,6 +157,15 @@ TEST_F(LogFormattedDateTest, AGrownBufferServesTheLaterPieces) {
 
 TEST_F(LogFormattedDateTest, AWideFieldIsNoReasonToThrow) {
     EXPECT_EQ(date("%6000000d").size(), 6000000U);
+}
+
+TEST_F(LogFormattedDateTest, WidthsTooLargeToCountAreTriedUntilMemoryEnds) {
+    for (const char* layout :
+         {"%99999999999999999999d", "%4000000000000000000d%400000000000000000d"}) {
+        const FailNth empty(Call::strftime, 1, EINVAL, FailNth::FROM_THEN_ON);
+        const FailNth memory(Call::new_array, 22, ENOMEM, FailNth::FROM_THEN_ON);
+        EXPECT_THROW(date(layout), std::bad_alloc) << layout;
+    }
 }
 
 TEST_F(LogFormattedDateTest, OneCachedTimeServesOneMessage) {

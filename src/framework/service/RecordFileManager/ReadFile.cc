@@ -130,11 +130,9 @@ void RecordFileManager::readLooped(char* buf, unsigned int readLen, std::FILE* i
     }
     // A chunk that came short is not completed: the next one goes to its own place. Its end never
     // lies beyond the buffer's.
-    std::size_t total = 0;
-    for (std::size_t at = 0; at < readLen && total < readLen; at += kChunk) {
+    for (std::size_t at = 0; at < readLen; at += kChunk) {
         const std::size_t wanted = std::min<std::size_t>(readLen - at, kChunk);
         const std::size_t got = std::fread(buf + at, 1, wanted, inFile);
-        total += got;
         if (got != wanted) storeLogger().error("Short read, record file may be corrupt.");
         if (got == 0) return;
     }
