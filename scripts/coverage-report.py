@@ -1,9 +1,9 @@
 #!/usr/bin/env python3
-"""Prints what the exports of llvm-cov say of src/ and holds it against the list of exemptions.
+"""Prints what the exports of llvm-cov say of src/ and include/, and holds it against the exemptions.
 
 Usage: coverage-report.py ROOT EXEMPTIONS EXPORT.json...
 
-Fails when a line or a branch of src/ is not covered and not exempt, and when an exempt one is
+Fails when a line or a branch is not covered and not exempt, and when an exempt one is
 covered after all. The exemptions are blocks like this one:
 
     src/util/Pathname/FileSystem.cc
@@ -98,14 +98,15 @@ class File:
 
 def read_exports(root, exports):
     files = {}
-    prefix = os.path.join(os.path.realpath(root), "src", "")
+    root = os.path.realpath(root)
+    prefixes = tuple(os.path.join(root, folder, "") for folder in ("src", "include"))
     for export in exports:
         with open(export, encoding="utf-8") as stream:
             entries = json.load(stream)["data"][0]["files"]
         for entry in entries:
             path = os.path.realpath(entry["filename"])
-            if path.startswith(prefix):
-                name = os.path.relpath(path, os.path.realpath(root))
+            if path.startswith(prefixes):
+                name = os.path.relpath(path, root)
                 files.setdefault(name, File(path, name)).add(entry)
     return [files[name] for name in sorted(files)]
 
@@ -162,7 +163,7 @@ def report(files, exemptions, measures_conditions):
             match = next((e for e in left if e[:3] == [file.name, kind, text]), None)
             if match:
                 left.remove(match)
-                print("  %4u  %s: %s  [exempt: %s]" % (line, kind, text, match[3]))
+                print("  %4u  (exempt) %s: %s" % (line, kind, text))
             else:
                 failures += 1
                 print("  %4u  %s: %s" % (line, kind, text))

@@ -1,5 +1,5 @@
 #!/bin/sh
-# Runs the whole suite with clang's counters and prints the line, branch and MC/DC coverage of src/.
+# Runs the whole suite with clang's counters and prints the library's line, branch and MC/DC coverage.
 # Usage: coverage.sh [JOBS]
 set -eu
 cd "$(dirname "$0")/.."
@@ -15,6 +15,10 @@ else
     suffix=
 fi
 
+# The programs are linked anew each time, because no rule says that they hold profile.o.
+tests=$build/tests/korvex-tests
+tool=$build/tools/korvex-records/korvex-records
+rm -f "$tests" "$tool"
 mkdir -p "$build"
 "clang++$suffix" -c -O1 scripts/coverage-profile.cc -o "$build/profile.o"
 cmake -S . -B "$build" -G Ninja -DCMAKE_BUILD_TYPE=None -DCMAKE_CXX_COMPILER="clang++$suffix" \
@@ -24,8 +28,6 @@ cmake --build "$build" -j "$jobs"
 # One file of counters for each process that was not forked: its forked children add to it (%m),
 # those that have become another user too. The checks of sources and package run nothing of this
 # build.
-tests=$build/tests/korvex-tests
-tool=$build/tools/korvex-records/korvex-records
 profiles=$(mktemp -d)
 trap 'rm -rf "$profiles"' EXIT
 chmod a+rwx "$profiles"

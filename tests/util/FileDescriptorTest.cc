@@ -341,6 +341,19 @@ TEST_F(FileDescriptorTest, AScopedDescriptorClosesItself) {
     EXPECT_FALSE(isOpen(number));
 }
 
+TEST_F(FileDescriptorTest, ASaferScopedDescriptorOpensOrTakesOver) {
+    writeFile(path("f"), "");
+    int number = -1;
+    {
+        const ScopedSaferFileDescriptor opened(path("f"));
+        EXPECT_NE(flagsOf(opened) & O_NONBLOCK, 0);
+        const ScopedSaferFileDescriptor taken(path("f").openReadOnly());
+        number = taken.osdep();
+        EXPECT_TRUE(isOpen(number));
+    }
+    EXPECT_FALSE(isOpen(number));
+}
+
 TEST_F(FileDescriptorTest, AssigningToAScopedDescriptorClosesTheOldOne) {
     writeFile(path("f"), "");
     ScopedFileDescriptor fd(path("f"));

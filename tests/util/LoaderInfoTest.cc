@@ -394,6 +394,14 @@ TEST_F(EnvironmentTest, EqualityLooksAtTheStart) {
     EXPECT_FALSE(first == Parsed({}));
 }
 
+TEST(LoaderInfoTest, AConstRecordShowsItsNode) {
+    LoaderInfo info;
+    info.setCommonComponentNode(xml::node("name", "content"));
+    const LoaderInfo& shown = info;
+    EXPECT_STREQ(shown.getCommonComponentNode().get_content(), "content");
+    EXPECT_EQ(&shown.getCommonComponentNode(), &info.getCommonComponentNode());
+}
+
 TEST(LoaderInfoTest, AParserThatCannotBeMadeIsNoMemory) {
     const FailNth fault(Call::poptGetContext, 1, ENOMEM);
     EXPECT_THROW(Parsed({}), std::bad_alloc);
