@@ -1,19 +1,38 @@
 #include "reference/Layout.h"
 
+#include <algorithm>
 #include <cctype>
+#include <cstring>
 #include <ctime>
-#include <regex>
 #include <vector>
 
 namespace reference {
 
 namespace {
 
+bool skipOneOf(const std::string& text, std::size_t& at, const char* characters) {
+    if (at == text.size() || std::strchr(characters, text[at]) == nullptr) return false;
+    ++at;
+    return true;
+}
+
+// Nothing but conversions to the text for the morning or the afternoon, which may be empty.
+bool isOnlyAmPm(const std::string& piece) {
+    for (std::size_t at = 0; at < piece.size();) {
+        if (!skipOneOf(piece, at, "%")) return false;
+        skipOneOf(piece, at, "_-^#");
+        while (skipOneOf(piece, at, "0123456789")) {
+        }
+        skipOneOf(piece, at, "EO");
+        if (!skipOneOf(piece, at, "p")) return false;
+    }
+    return true;
+}
+
 std::optional<std::string> strftimeOf(const std::string& piece, const struct tm& local) {
-    static const std::regex onlyAmPm("(%[_^#-]?[0-9]*[EO]?p)*");
     static std::vector<char> buffer(1 << 20);
     const std::size_t n = std::strftime(buffer.data(), buffer.size(), piece.c_str(), &local);
-    if (n == 0 && !std::regex_match(piece, onlyAmPm)) return std::nullopt;
+    if (n == 0 && !isOnlyAmPm(piece)) return std::nullopt;
     return std::string(buffer.data(), n);
 }
 
@@ -145,8 +164,13 @@ std::optional<std::string> layOut(const std::string& pattern, const Line& line) 
 }
 
 bool isReasonable(const std::string& pattern) {
-    static const std::regex unreasonable("[1-9][0-9]{3}|%[-0]?[0-9]*(\\.[0-9]*)?u");
-    return !std::regex_search(pattern, unreasonable);
+    unsigned digits = 0;
+    for (const char c : pattern) {
+        const bool isDigit = std::isdigit(static_cast<unsigned char>(c)) != 0;
+        digits = isDigit && (digits > 0 || c != '0') ? digits + 1 : 0;
+        if (digits > 3) return false;
+    }
+    return pattern.find('u') == pattern.npos;
 }
 
 }  // namespace reference

@@ -328,7 +328,13 @@ void* operator new[](std::size_t n) {
     if (fails(Call::new_array)) throw std::bad_alloc();
     return operator new(n);
 }
+void* operator new(std::size_t n, const std::nothrow_t&) noexcept {
+    return fails(Call::allocation) ? nullptr : std::malloc(std::max<std::size_t>(n, 1));
+}
 void operator delete(void* p) noexcept {
+    std::free(p);
+}
+void operator delete(void* p, const std::nothrow_t&) noexcept {
     std::free(p);
 }
 void operator delete[](void* p) noexcept {

@@ -4,6 +4,7 @@
 #include <sys/wait.h>
 
 #include <csignal>
+#include <ostream>
 
 #include "tools/RecordsTool.h"
 
@@ -39,6 +40,8 @@ struct Writing {
     const char* name;
     std::vector<std::string> arguments;
     std::vector<std::pair<std::string, std::string>> after;
+
+    friend void PrintTo(const Writing& writing, std::ostream* out) { *out << writing.name; }
 };
 
 class KilledWriting : public SafetyTest, public testing::WithParamInterface<Writing> {};
