@@ -29,12 +29,25 @@ bool isOnlyAmPm(const std::string& piece) {
     return true;
 }
 
-std::optional<std::string> strftimeOf(const std::string& piece, const struct tm& local) {
-    static std::vector<char> buffer(1 << 20);
-    const std::size_t n = std::strftime(buffer.data(), buffer.size(), piece.c_str(), &local);
-    if (n == 0 && !isOnlyAmPm(piece)) return std::nullopt;
-    return std::string(buffer.data(), n);
-}
+// What one date has to write its pieces into; it grows by doubling and stays grown.
+class Buffer {
+  public:
+    std::optional<std::string> strftimeOf(const std::string& piece, const struct tm& local) {
+        for (;;) {
+            const std::size_t n =
+                std::strftime(_bytes.data(), _bytes.size(), piece.c_str(), &local);
+            if (n > 0) return std::string(_bytes.data(), n);
+            if (isOnlyAmPm(piece)) return "";  // or too wide: nobody can tell
+            if (_bytes.size() >= kFarTooLarge) return std::nullopt;
+            _bytes.resize(2 * _bytes.size());
+        }
+    }
+
+  private:
+    static constexpr std::size_t kFarTooLarge = 1 << 20;
+
+    std::vector<char> _bytes = std::vector<char>(64);
+};
 
 std::string threeDigits(int n) {
     std::string digits = std::to_string(n);
@@ -100,6 +113,7 @@ std::optional<std::string> date(const char* name, std::size_t length, int sec, i
     struct tm local {};
     localtime_r(&seconds, &local);
     std::string out;
+    Buffer buffer;
     while (!pattern.empty()) {
         if (pattern.compare(0, 2, "%l") == 0) {
             out += threeDigits(usec / 1000);
@@ -107,7 +121,7 @@ std::optional<std::string> date(const char* name, std::size_t length, int sec, i
             continue;
         }
         const std::size_t end = pattern.find("%l");
-        const auto piece = strftimeOf(pattern.substr(0, end), local);
+        const auto piece = buffer.strftimeOf(pattern.substr(0, end), local);
         if (!piece) return std::nullopt;
         out += *piece;
         pattern.erase(0, end);
