@@ -1,3 +1,5 @@
+#include <korvex/util/Pathname.h>
+
 #include <sys/ptrace.h>
 #include <sys/resource.h>
 #include <sys/stat.h>
@@ -106,6 +108,28 @@ TEST_F(SafetyTest, WhatAKilledRunSavedAsideIsNotTakenForTheNext) {
     writeFile(data + ".copy.unfinished", "half");
     EXPECT_EQ(run({"put", "a", "1"}).status, 0);
     EXPECT_EQ(stored(), fileOf({{"a", "1"}}));
+}
+
+TEST_F(SafetyTest, APlantedLinkIsNotWrittenThrough) {
+    const std::string victim = dir.file("victim");
+    for (const char* name : {".new", ".copy.unfinished", ".copy"}) {
+        writeFile(victim, "precious");
+        writeFile(data, fileOf({{"a", "1"}}));
+        ASSERT_TRUE(Pathname(victim).symlinkTo(Pathname(data + name)));
+        EXPECT_EQ(run({"put", "b", "2"}).status, 0) << name;
+        EXPECT_EQ(readFile(victim), "precious") << name;
+        EXPECT_EQ(stored(), fileOf({{"a", "1"}, {"b", "2"}})) << name;
+        EXPECT_THAT(beside(), ElementsAre("data", "data.lock")) << name;
+    }
+}
+
+TEST_F(SafetyTest, ALinkInTheLocksPlaceMakesNoFileAndLetsNobodyWrite) {
+    writeFile(data, fileOf({{"a", "1"}}));
+    ASSERT_TRUE(Pathname(dir.file("elsewhere")).symlinkTo(Pathname(data + ".lock")));
+    EXPECT_EQ(run({"put", "b", "2"}).status, 4);
+    EXPECT_FALSE(Pathname(dir.file("elsewhere")).exists());
+    EXPECT_EQ(stored(), fileOf({{"a", "1"}}));
+    EXPECT_EQ(run({"get", "a"}).out, "1");
 }
 
 TEST_F(SafetyTest, AFifoDoesNotHoldTheToolUp) {
