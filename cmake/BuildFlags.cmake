@@ -1,7 +1,7 @@
 # korvex_flags: how our own code is compiled; private to this tree, never a consumer's business.
 add_library(korvex_flags INTERFACE)
 target_compile_options(korvex_flags INTERFACE
-  -Wall -Wextra -Wpedantic -Wconversion -Wshadow
+  -Wall -Wextra -Wpedantic -Wconversion -Wshadow -Wformat-security
   # __FILE__ in assertions reads "src/..." wherever the tree lies.
   "-fmacro-prefix-map=${PROJECT_SOURCE_DIR}/=")
 if(CMAKE_CXX_COMPILER_ID MATCHES Clang)

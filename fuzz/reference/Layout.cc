@@ -1,21 +1,53 @@
 #include "reference/Layout.h"
 
+#include <algorithm>
 #include <cctype>
+#include <cstring>
 #include <ctime>
-#include <regex>
 #include <vector>
 
 namespace reference {
 
 namespace {
 
-std::optional<std::string> strftimeOf(const std::string& piece, const struct tm& local) {
-    static const std::regex onlyAmPm("(%[_^#-]?[0-9]*[EO]?p)*");
-    static std::vector<char> buffer(1 << 20);
-    const std::size_t n = std::strftime(buffer.data(), buffer.size(), piece.c_str(), &local);
-    if (n == 0 && !std::regex_match(piece, onlyAmPm)) return std::nullopt;
-    return std::string(buffer.data(), n);
+bool skipOneOf(const std::string& text, std::size_t& at, const char* characters) {
+    if (at == text.size() || std::strchr(characters, text[at]) == nullptr) return false;
+    ++at;
+    return true;
 }
+
+// Nothing but conversions to the text for the morning or the afternoon, which may be empty.
+bool isOnlyAmPm(const std::string& piece) {
+    for (std::size_t at = 0; at < piece.size();) {
+        if (!skipOneOf(piece, at, "%")) return false;
+        skipOneOf(piece, at, "_-^#");
+        while (skipOneOf(piece, at, "0123456789")) {
+        }
+        skipOneOf(piece, at, "EO");
+        if (!skipOneOf(piece, at, "p")) return false;
+    }
+    return true;
+}
+
+// What one date has to write its pieces into; it grows by doubling and stays grown.
+class Buffer {
+  public:
+    std::optional<std::string> strftimeOf(const std::string& piece, const struct tm& local) {
+        for (;;) {
+            const std::size_t n =
+                std::strftime(_bytes.data(), _bytes.size(), piece.c_str(), &local);
+            if (n > 0) return std::string(_bytes.data(), n);
+            if (isOnlyAmPm(piece)) return "";  // or too wide: nobody can tell
+            if (_bytes.size() >= kFarTooLarge) return std::nullopt;
+            _bytes.resize(2 * _bytes.size());
+        }
+    }
+
+  private:
+    static constexpr std::size_t kFarTooLarge = 1 << 20;
+
+    std::vector<char> _bytes = std::vector<char>(64);
+};
 
 std::string threeDigits(int n) {
     std::string digits = std::to_string(n);
@@ -81,6 +113,7 @@ std::optional<std::string> date(const char* name, std::size_t length, int sec, i
     struct tm local {};
     localtime_r(&seconds, &local);
     std::string out;
+    Buffer buffer;
     while (!pattern.empty()) {
         if (pattern.compare(0, 2, "%l") == 0) {
             out += threeDigits(usec / 1000);
@@ -88,7 +121,7 @@ std::optional<std::string> date(const char* name, std::size_t length, int sec, i
             continue;
         }
         const std::size_t end = pattern.find("%l");
-        const auto piece = strftimeOf(pattern.substr(0, end), local);
+        const auto piece = buffer.strftimeOf(pattern.substr(0, end), local);
         if (!piece) return std::nullopt;
         out += *piece;
         pattern.erase(0, end);
@@ -145,8 +178,13 @@ std::optional<std::string> layOut(const std::string& pattern, const Line& line) 
 }
 
 bool isReasonable(const std::string& pattern) {
-    static const std::regex unreasonable("[1-9][0-9]{3}|%[-0]?[0-9]*(\\.[0-9]*)?u");
-    return !std::regex_search(pattern, unreasonable);
+    unsigned digits = 0;
+    for (const char c : pattern) {
+        const bool isDigit = std::isdigit(static_cast<unsigned char>(c)) != 0;
+        digits = isDigit && (digits > 0 || c != '0') ? digits + 1 : 0;
+        if (digits > 3) return false;
+    }
+    return pattern.find('u') == pattern.npos;
 }
 
 }  // namespace reference

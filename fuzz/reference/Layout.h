@@ -24,7 +24,8 @@ std::optional<std::string> date(const char* name, std::size_t length, int sec, i
 // The line; nothing as above.
 std::optional<std::string> layOut(const std::string& pattern, const Line& line);
 
-// Whether the pattern is one to try: no widths that would fill the memory, no clock().
+// Whether the pattern is one to try: no widths that would fill the memory, no "u", which is
+// clock().
 bool isReasonable(const std::string& pattern);
 
 }  // namespace reference

@@ -2,7 +2,7 @@
 
 #include <unistd.h>
 
-#include <csignal>
+#include <cerrno>
 
 #include "Check.h"
 
@@ -41,16 +41,27 @@ class Shell {
 
     std::string read(const std::string& word) const {
         const std::string line = "printf '%s\\0' " + word + "\n";
-        check(write(_in, line.data(), line.size()) == static_cast<ssize_t>(line.size()), "write");
+        const auto size = static_cast<ssize_t>(line.size());
+        check(again([&] { return write(_in, line.data(), line.size()); }) == size, "write");
         std::string all;
         for (char c = 'x'; c != '\0';) {
-            check(::read(_out, &c, 1) == 1, "the shell has ended");
+            check(again([&] { return ::read(_out, &c, 1); }) == 1, "the shell has ended");
             if (c != '\0') all += c;
         }
         return all;
     }
 
   private:
+    // libFuzzer's alarm interrupts calls.
+    template <class Call>
+    static ssize_t again(const Call& call) {
+        ssize_t n;
+        do {
+            n = call();
+        } while (n < 0 && errno == EINTR);
+        return n;
+    }
+
     int _in = -1;
     int _out = -1;
 };

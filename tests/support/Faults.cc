@@ -20,6 +20,8 @@
 #include <iterator>
 #include <new>
 
+#include "support/LinkNames.h"
+
 namespace testsupport {
 
 namespace {
@@ -183,12 +185,25 @@ using testsupport::Call;
 using testsupport::fails;
 using testsupport::judge;
 
+// Gives a hook the name under which the linker looks for it.
+#define REAL(name) __asm__("__real_" LINK_NAME_##name)
+#define WRAP(name) __asm__("__wrap_" LINK_NAME_##name)
+
 // One hook a call. FORWARD covers those that only fail or go through.
 #define FORWARD(failure, result, name, parameters, arguments) \
     result __real_##name parameters;                          \
     result __wrap_##name parameters {                         \
         if (fails(Call::name)) return failure;                \
         return __real_##name arguments;                       \
+    }
+
+// The same for those that the linker may know by another name.
+#define FORWARD_RENAMED(failure, result, name, parameters, arguments) \
+    result __real_##name parameters REAL(name);                       \
+    result __wrap_##name parameters WRAP(name);                       \
+    result __wrap_##name parameters {                                 \
+        if (fails(Call::name)) return failure;                        \
+        return __real_##name arguments;                               \
     }
 
 // The same for calls that return their error number.
@@ -201,7 +216,8 @@ using testsupport::judge;
 
 extern "C" {
 
-int __real_open(const char* path, int flags, mode_t mode);
+int __real_open(const char* path, int flags, mode_t mode) REAL(open);
+int __wrap_open(const char* path, int flags, ...) WRAP(open);
 int __wrap_open(const char* path, int flags, ...) {
     va_list ap;
     va_start(ap, flags);
@@ -210,7 +226,8 @@ int __wrap_open(const char* path, int flags, ...) {
     return fails(Call::open) ? -1 : __real_open(path, flags, mode);
 }
 
-int __real_fcntl(int fd, int command, long argument);
+int __real_fcntl(int fd, int command, long argument) REAL(fcntl);
+int __wrap_fcntl(int fd, int command, ...) WRAP(fcntl);
 int __wrap_fcntl(int fd, int command, ...) {
     va_list ap;
     va_start(ap, command);
@@ -289,7 +306,8 @@ int __wrap_pthread_join(pthread_t thread, void** result) {
     return error != 0 ? error : joined;
 }
 
-int __real_stat(const char* path, struct stat* st);
+int __real_stat(const char* path, struct stat* st) REAL(stat);
+int __wrap_stat(const char* path, struct stat* st) WRAP(stat);
 int __wrap_stat(const char* path, struct stat* st) {
     const auto verdict = judge(Call::stat);
     if (verdict.error != 0) {
@@ -301,7 +319,8 @@ int __wrap_stat(const char* path, struct stat* st) {
     return result;
 }
 
-int __real_gettimeofday(struct timeval* tv, void* zone);
+int __real_gettimeofday(struct timeval* tv, void* zone) REAL(gettimeofday);
+int __wrap_gettimeofday(struct timeval* tv, void* zone) WRAP(gettimeofday);
 int __wrap_gettimeofday(struct timeval* tv, void* zone) {
     const auto verdict = judge(Call::gettimeofday);
     if (verdict.error != 0) {
@@ -314,15 +333,15 @@ int __wrap_gettimeofday(struct timeval* tv, void* zone) {
 }
 
 FORWARD(-1, ssize_t, writev, (int fd, const struct iovec* vec, int n), (fd, vec, n))
-FORWARD(-1, int, fstat, (int fd, struct stat* st), (fd, st))
+FORWARD_RENAMED(-1, int, fstat, (int fd, struct stat* st), (fd, st))
 FORWARD(-1, int, access, (const char* path, int mode), (path, mode))
-FORWARD(-1, off_t, lseek, (int fd, off_t off, int whence), (fd, off, whence))
+FORWARD_RENAMED(-1, off_t, lseek, (int fd, off_t off, int whence), (fd, off, whence))
 FORWARD(-1, int, fsync, (int fd), (fd))
 FORWARD(-1, int, rename, (const char* from, const char* to), (from, to))
 FORWARD(-1, int, unlink, (const char* path), (path))
-FORWARD(nullptr, FILE*, fopen, (const char* path, const char* mode), (path, mode))
+FORWARD_RENAMED(nullptr, FILE*, fopen, (const char* path, const char* mode), (path, mode))
 FORWARD(nullptr, void*, calloc, (size_t n, size_t size), (n, size))
-FORWARD(nullptr, struct tm*, localtime_r, (const time_t* t, struct tm* out), (t, out))
+FORWARD_RENAMED(nullptr, struct tm*, localtime_r, (const time_t* t, struct tm* out), (t, out))
 FORWARD(0, size_t, strftime, (char* buf, size_t n, const char* fmt, const struct tm* tm),
         (buf, n, fmt, tm))
 FORWARD(-1, int, setenv, (const char* name, const char* value, int overwrite),
@@ -347,10 +366,15 @@ FORWARD_NUMBER(Call::pthread_cond_init, pthread_cond_init,
                (pthread_cond_t * cond, const pthread_condattr_t* attr), (cond, attr))
 FORWARD_NUMBER(Call::pthread_cond_wait, pthread_cond_wait,
                (pthread_cond_t * cond, pthread_mutex_t* mutex), (cond, mutex))
-FORWARD_NUMBER(Call::pthread_cond_clockwait, pthread_cond_clockwait,
-               (pthread_cond_t * cond, pthread_mutex_t* mutex, clockid_t clock,
-                const struct timespec* until),
-               (cond, mutex, clock, until))
+int __real_pthread_cond_clockwait(pthread_cond_t* cond, pthread_mutex_t* mutex, clockid_t clock,
+                                  const struct timespec* until) REAL(pthread_cond_clockwait);
+int __wrap_pthread_cond_clockwait(pthread_cond_t* cond, pthread_mutex_t* mutex, clockid_t clock,
+                                  const struct timespec* until) WRAP(pthread_cond_clockwait);
+int __wrap_pthread_cond_clockwait(pthread_cond_t* cond, pthread_mutex_t* mutex, clockid_t clock,
+                                  const struct timespec* until) {
+    if (const int error = judge(Call::pthread_cond_clockwait).error) return error;
+    return __real_pthread_cond_clockwait(cond, mutex, clock, until);
+}
 FORWARD_NUMBER(Call::pthread_key_create, pthread_key_create,
                (pthread_key_t * key, void (*cleanup)(void*)), (key, cleanup))
 FORWARD_NUMBER(Call::pthread_setspecific, pthread_setspecific,
@@ -372,7 +396,13 @@ void* operator new[](std::size_t n) {
     if (fails(Call::new_array)) throw std::bad_alloc();
     return operator new(n);
 }
+void* operator new(std::size_t n, const std::nothrow_t&) noexcept {
+    return fails(Call::allocation) ? nullptr : std::malloc(std::max<std::size_t>(n, 1));
+}
 void operator delete(void* p) noexcept {
+    std::free(p);
+}
+void operator delete(void* p, const std::nothrow_t&) noexcept {
     std::free(p);
 }
 void operator delete[](void* p) noexcept {

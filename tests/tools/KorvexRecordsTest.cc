@@ -14,6 +14,7 @@
 
 #include "support/Child.h"
 #include "support/TempDir.h"
+#include "tools/ExecTool.h"
 
 // The tool as a user runs it: a process of its own each time.
 
@@ -55,11 +56,7 @@ class KorvexRecordsTest : public testing::Test {
                 setrlimit(RLIMIT_FSIZE, &limit);
                 signal(SIGXFSZ, SIG_IGN);
             }
-            std::vector<char*> argv{const_cast<char*>("korvex-records")};
-            for (const std::string& a : arguments)
-                argv.push_back(const_cast<char*>(a.c_str()));
-            argv.push_back(nullptr);
-            execv(KORVEX_RECORDS, argv.data());
+            testsupport::execTool(arguments);
             return 97;
         });
     }

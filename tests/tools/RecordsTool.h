@@ -14,6 +14,7 @@
 
 #include "support/Child.h"
 #include "support/TempDir.h"
+#include "tools/ExecTool.h"
 
 namespace testsupport {
 
@@ -62,11 +63,7 @@ class RecordsToolTest : public testing::Test {
     int execTool(const std::vector<std::string>& arguments) const {
         setenv("KORVEX_HOME", dir.file("home").c_str(), 1);
         setenv("KORVEX_DB", dir.file("db").c_str(), 1);
-        std::vector<char*> argv{const_cast<char*>("korvex-records")};
-        for (const std::string& one : arguments)
-            argv.push_back(const_cast<char*>(one.c_str()));
-        argv.push_back(nullptr);
-        execv(KORVEX_RECORDS, argv.data());
+        testsupport::execTool(arguments);
         return 127;
     }
     std::string stored() const { return readFile(data); }

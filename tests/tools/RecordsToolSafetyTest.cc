@@ -1,9 +1,12 @@
+#include <korvex/util/Pathname.h>
+
 #include <sys/ptrace.h>
 #include <sys/resource.h>
 #include <sys/stat.h>
 #include <sys/wait.h>
 
 #include <csignal>
+#include <ostream>
 
 #include "tools/RecordsTool.h"
 
@@ -39,11 +42,14 @@ struct Writing {
     const char* name;
     std::vector<std::string> arguments;
     std::vector<std::pair<std::string, std::string>> after;
+
+    friend void PrintTo(const Writing& writing, std::ostream* out) { *out << writing.name; }
 };
 
 class KilledWriting : public SafetyTest, public testing::WithParamInterface<Writing> {};
 
 TEST_P(KilledWriting, LeavesTheOldFileOrTheNewOneAndTheNextRunFindsIt) {
+    if (isEmulated()) GTEST_SKIP() << "the emulator has no ptrace";
     const std::string before = fileOf({{"a", "1"}, {"c", "3"}});
     const std::string after = fileOf(GetParam().after);
     writeFile(dir.file("dump"), "VERSION=3\nHEADER=END\n 62\n 32\nDATA=END\n");
@@ -102,6 +108,28 @@ TEST_F(SafetyTest, WhatAKilledRunSavedAsideIsNotTakenForTheNext) {
     writeFile(data + ".copy.unfinished", "half");
     EXPECT_EQ(run({"put", "a", "1"}).status, 0);
     EXPECT_EQ(stored(), fileOf({{"a", "1"}}));
+}
+
+TEST_F(SafetyTest, APlantedLinkIsNotWrittenThrough) {
+    const std::string victim = dir.file("victim");
+    for (const char* name : {".new", ".copy.unfinished", ".copy"}) {
+        writeFile(victim, "precious");
+        writeFile(data, fileOf({{"a", "1"}}));
+        ASSERT_TRUE(Pathname(victim).symlinkTo(Pathname(data + name)));
+        EXPECT_EQ(run({"put", "b", "2"}).status, 0) << name;
+        EXPECT_EQ(readFile(victim), "precious") << name;
+        EXPECT_EQ(stored(), fileOf({{"a", "1"}, {"b", "2"}})) << name;
+        EXPECT_THAT(beside(), ElementsAre("data", "data.lock")) << name;
+    }
+}
+
+TEST_F(SafetyTest, ALinkInTheLocksPlaceMakesNoFileAndLetsNobodyWrite) {
+    writeFile(data, fileOf({{"a", "1"}}));
+    ASSERT_TRUE(Pathname(dir.file("elsewhere")).symlinkTo(Pathname(data + ".lock")));
+    EXPECT_EQ(run({"put", "b", "2"}).status, 4);
+    EXPECT_FALSE(Pathname(dir.file("elsewhere")).exists());
+    EXPECT_EQ(stored(), fileOf({{"a", "1"}}));
+    EXPECT_EQ(run({"get", "a"}).out, "1");
 }
 
 TEST_F(SafetyTest, AFifoDoesNotHoldTheToolUp) {

@@ -82,7 +82,7 @@ RecordStore::~RecordStore() {
 // writing either.
 void RecordStore::lock() {
     const Pathname name(_file + ".lock");
-    _lock = FileDescriptor(::open(name.c_str(), O_RDONLY | O_CREAT | O_CLOEXEC, 0600));
+    _lock = FileDescriptor(::open(name.c_str(), O_RDONLY | O_CREAT | O_NOFOLLOW | O_CLOEXEC, 0600));
     if (!_lock.valid()) return;
     while (flock(_lock.osdep(), LOCK_EX) != 0) {
         if (errno != EINTR) throw Failure(IO_ERROR, withErrno("cannot lock " + name));
@@ -131,7 +131,7 @@ void RecordStore::beginChange() {
     if (!_lock.valid()) throw Failure(IO_ERROR, withErrno("cannot lock " + _file + ".lock"));
     _changing = true;
     if (!_scan.missing) makeSafeCopy(_file, _copy);
-    _new.unlink();  // what a killed run left must not pass for what is saved now
+    _new.unlink();  // what a killed run left must not pass for what is saved now, nor a link
     manager().setDBFile(_new);
 }
 

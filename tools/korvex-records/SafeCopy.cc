@@ -11,7 +11,8 @@ namespace {
 bool copyWhole(const Pathname& from, const Pathname& to) {
     const ScopedFileDescriptor in(from);
     ScopedFileDescriptor out;
-    out = to.openCreateOrReplace(Pathname::CREATE_PRIVATE);
+    to.unlink();  // a former run's, or a link that somebody planted: neither is written to
+    out = to.openCreateOnly(Pathname::CREATE_PRIVATE);
     return in.valid() && out.valid() && in.copyTo(static_cast<FileDescriptor>(out)) &&
            takeAttributes(from, to) && out.sync() == 0;
 }

@@ -29,8 +29,8 @@ inline namespace korvex {
 // goes there behind its level's name. Static destructors, exit handlers and threads that outlive
 // main may log too.
 //
-// A child of fork(2) may log whatever the parent's other threads were doing (but not fork in a signal
-// handler that interrupted logging: the handler would wait for itself).
+// A child of fork(2) may log whatever the parent's other threads were doing (but not fork in a
+// signal handler that interrupted logging: the handler would wait for itself).
 //
 // The level methods never throw, leave errno as it was and may be called from any thread. Their
 // printf forms take printf(3)'s conversions and %m, the text of the errno at the call. (g++

@@ -38,8 +38,9 @@ struct PersistentFullData {
 // callers; the first instance() comes before other threads use the store. One process at a time
 // should use a file: nothing locks it.
 //
-// A child of fork(2) may use the store, of which it has its own copy, whatever put() calls were under
-// way in the parent's other threads; its file is the parent's still, so it should name its own.
+// A child of fork(2) may use the store, of which it has its own copy, whatever put() calls were
+// under way in the parent's other threads; its file is the parent's still, so it should name its
+// own.
 //
 // What it does not promise: a save rewrites the file in place, without fsync(2), so a crash or a
 // full disk in its middle leaves the file cut after its last complete write (memory is never

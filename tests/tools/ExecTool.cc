@@ -1,0 +1,32 @@
+#include "tools/ExecTool.h"
+
+#include <unistd.h>
+
+#include <cstdlib>
+
+namespace testsupport {
+
+namespace {
+
+const char* emulator() {
+    const char* const path = std::getenv("KORVEX_EMULATOR");
+    return path != nullptr && *path != '\0' ? path : nullptr;
+}
+
+}  // namespace
+
+bool isEmulated() {
+    return emulator() != nullptr;
+}
+
+void execTool(const std::vector<std::string>& arguments) {
+    std::vector<const char*> argv;
+    if (isEmulated()) argv.insert(argv.end(), {emulator(), "-0", "korvex-records", KORVEX_RECORDS});
+    if (!isEmulated()) argv.push_back("korvex-records");
+    for (const std::string& one : arguments)
+        argv.push_back(one.c_str());
+    argv.push_back(nullptr);
+    execv(isEmulated() ? emulator() : KORVEX_RECORDS, const_cast<char**>(argv.data()));
+}
+
+}  // namespace testsupport
