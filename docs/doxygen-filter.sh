@@ -1,65 +1,98 @@
 #!/bin/sh
-# Gives a public header to Doxygen: its plain comments become Doxygen's, and one that stands above
-# several declarations is repeated for each. A page gets the marks that Doxygen needs for links to
-# headings. Usage: doxygen-filter.sh FILE
+# Gives Doxygen what it can read. A public header's plain comments become Doxygen's, and one that
+# stands above several declarations is repeated for each. A page's headings get labels, and its code
+# keeps the percent signs and blanks that Doxygen would take away. Usage: doxygen-filter.sh FILE
 set -eu
-case $1 in
-    *.md)
-        # A link to a heading finds it by a label: lower case, blanks as hyphens, other marks left out.
-        awk '
-        /^<!-- .* -->$/ { next }
-        /^```/ { code = !code }
-        !code && /^##+ / {
-            label = tolower($0)
-            sub(/^#+ /, "", label)
-            gsub(/ /, "-", label)
-            gsub(/[^a-z0-9_-]/, "", label)
-            $0 = $0 " {#" label "}"
-        }
-        { print }
-        ' "$1"
-        exit
-        ;;
-esac
-# shellcheck disable=SC2016  # awk's own dollars
-awk '
-# Markup and commands that the comment does not mean; code, which is indented, stays as it is.
-function quoted(text) {
-    if (text ~ /^   */) return "    " text
-    gsub(/[\\@<>%#&]/, "\\\\&", text)
-    return text
-}
-function flush_comment(    i) {
-    for (i = 1; i <= lines; i++) print indent "///" comment[i]
-}
-# A comment line: kept until the declaration is seen.
-/^ *\/\/( |$)/ {
-    if (!in_comment) { lines = 0; in_comment = 1 }
-    match($0, /^ */)
-    indent = substr($0, 1, RLENGTH)
-    text = substr($0, RLENGTH + 4)
-    comment[++lines] = text == "" ? "" : " " quoted(text)
-    next
-}
-# Nothing declared below it: a remark on the file or on a section, and no more.
-/^ *$/ || /^ *(private|protected|public):/ || /^[ \t]*[}#]/ {
-    in_comment = 0; lines = 0; open = 0
-    print
-    next
-}
-{
-    in_comment = 0
-    trailing = ""
-    # Where the comment behind a declaration is its own.
-    if (match($0, / +\/\/ /) && $0 !~ /NOLINT/) {
-        trailing = " ///< " quoted(substr($0, RSTART + RLENGTH))
-        $0 = substr($0, 1, RSTART - 1)
+
+# shellcheck disable=SC2016  # awk's own dollars, here and below
+page() {
+    awk '
+    # A code span as HTML, where Doxygen leaves out less once each mark is quoted.
+    function span(text) {
+        if (text !~ /%[A-Za-z]|  /) return "`" text "`"
+        gsub(/[\\@<>%#&$*_]/, "\\\\&", text)
+        gsub(/--/, "\\--", text)
+        gsub(/  /, "\\&nbsp;\\&nbsp;", text)
+        return "<code>" text "</code>"
     }
-    sub(/ +\/\/ NOLINT.*/, "")
-    if (!open && lines > 0 && trailing == "") flush_comment()
-    print $0 trailing
-    # A declaration ends with its line, or goes on.
-    open = $0 !~ /[;}]$/
-    if ($0 ~ /[{]$/) { lines = 0; open = 0 }
+    function spans(line,    out) {
+        while (match(line, /`[^`]+`/)) {
+            out = out substr(line, 1, RSTART - 1) span(substr(line, RSTART + 1, RLENGTH - 2))
+            line = substr(line, RSTART + RLENGTH)
+        }
+        return out line
+    }
+    /^<!-- .* -->$/ { next }
+    /^```/ { code = !code }
+    code { print; next }
+    # A link finds a heading by its label: lower case, blanks as hyphens, other marks left out.
+    /^##+ / {
+        label = tolower($0)
+        sub(/^#+ /, "", label)
+        gsub(/ /, "-", label)
+        gsub(/[^a-z0-9_-]/, "", label)
+        $0 = $0 " {#" label "}"
+    }
+    { print spans($0) }
+    ' "$1"
 }
-' "$1"
+
+header() {
+    awk '
+    # Marks that are no commands in the comment; code, which is indented, stays as it is.
+    function quoted(text) {
+        if (text ~ /^   */) return "    " text
+        gsub(/[\\@<>%#&]/, "\\\\&", text)
+        return text
+    }
+    function repeat_comment(    i) {
+        if (used && /^ *virtual ~|^ *~/) {
+            print indent "/// Ends the object."
+            return
+        }
+        if (used && /= delete;$/) {
+            print indent "/// Not possible."
+            return
+        }
+        for (i = 1; i <= lines; i++) print indent "///" comment[i]
+        used = 1
+    }
+    # A comment is kept until the declaration below it is seen.
+    /^ *\/\/( |$)/ {
+        if (!in_comment) { lines = 0; in_comment = 1; used = 0 }
+        match($0, /^ */)
+        indent = substr($0, 1, RLENGTH)
+        text = substr($0, RLENGTH + 4)
+        comment[++lines] = text == "" ? "" : " " quoted(text)
+        next
+    }
+    # Nothing is declared below it: a remark on the file or on a section, and no more.
+    /^ *$/ || /^ *(private|protected|public):/ || /^[ \t]*[}#]/ {
+        in_comment = lines = open = 0
+        print
+        next
+    }
+    {
+        in_comment = 0
+        # Inline, each class would appear twice; told once, it lists the functions and levels.
+        if (sub(/^inline namespace/, "namespace") && FILENAME ~ /LoaderInfo/) {
+            print "/// All of Korvex. The namespace is inline: names work with and without it."
+        }
+        sub(/ +\/\/ NOLINT.*/, "")
+        trailing = ""
+        if (match($0, / +\/\/ /)) {  # a comment of its own
+            trailing = " ///< " quoted(substr($0, RSTART + RLENGTH))
+            $0 = substr($0, 1, RSTART - 1)
+        }
+        if (!open && lines > 0 && trailing == "") repeat_comment()
+        print $0 trailing
+        open = $0 !~ /[;{}]$/  # the declaration goes on in the next line
+        if ($0 ~ /[{]$/) lines = 0
+    }
+    ' "$1"
+}
+
+case $1 in
+    *.md) page "$1" ;;
+    *) header "$1" ;;
+esac
