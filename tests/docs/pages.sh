@@ -1,7 +1,7 @@
 #!/bin/sh
-# Checks the pages below docs/: each block of code says by the comment before it, "sample: FILE", which
-# sample it shows, and shows just that; each sample is shown; each link leads to a page, a heading or a
-# file that is there. Usage: pages.sh SOURCE-DIR
+# Checks the pages below docs/ and CONTRIBUTING.md: each block of code says by the comment before it,
+# "sample: FILE", which sample it shows, and shows just that; each sample is shown; each link leads to
+# a page, a heading or a file that is there; worked changes apply. Usage: pages.sh SOURCE-DIR
 set -eu
 cd "$1/docs"
 work=$(mktemp -d)
@@ -9,7 +9,8 @@ trap 'rm -rf "$work"' EXIT
 bad=0
 
 # Commands and diagrams need no sample; a page says "diagram" before a diagram.
-for page in *.md; do
+for path in *.md ../CONTRIBUTING.md; do
+    page=${path##*/}
     awk -v page="$page" -v work="$work" '
     function begin(sample) { file = work "/block" ++count; printf "" > file; print page ":" NR, sample, file }
     /^<!-- sample: .* -->$/ { named = $3; next }
@@ -29,7 +30,7 @@ for page in *.md; do
     { table = 0 }
     /./ && named != "" { print page ":" NR, named, "nothing"; named = "" }
     END { if (fenced) print page ":" NR, "-", "open" }
-    ' "$page"
+    ' "$path"
     mkdir -p "$work/$page"
     mv "$work"/block* "$work/$page/" 2> /dev/null || true
 done > "$work/list"
@@ -69,6 +70,11 @@ grep -on '](\([^)]*\))' ./*.md ../README.md ../CONTRIBUTING.md | sed 's/:[0-9]*:
     done > "$work/dead"
 cat "$work/dead"
 [ ! -s "$work/dead" ] || bad=1
+
+# The worked changes fit the sources.
+for change in samples/*.diff; do
+    (cd .. && git apply --check "docs/$change") || { echo "$change does not apply"; bad=1; }
+done
 
 [ "$(wc -l < "$work/list")" -ge 70 ] || { echo "too few blocks found"; bad=1; }
 exit $bad
