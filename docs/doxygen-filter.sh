@@ -25,15 +25,34 @@ page() {
     /^<!-- .* -->$/ { next }
     /^```/ { code = !code }
     code { print; next }
+    # A link to a heading of another page names its label alone; one to a file that is no page, of
+    # the kinds that the sources have, becomes text.
+    function links(line) {
+        while (match(line, /\]\([a-z-]*\.md#/)) {
+            line = substr(line, 1, RSTART + 1) "@ref " substr(line, RSTART + RLENGTH)
+        }
+        while (match(line, /\[[^]]*\]\([^):#@]*\.(txt|h|cc|sh|cfg)\)/)) {
+            text = substr(line, RSTART + 1, RLENGTH - 1)
+            sub(/\]\(.*/, "", text)
+            line = substr(line, 1, RSTART - 1) text substr(line, RSTART + RLENGTH)
+        }
+        return line
+    }
     # A link finds a heading by its label: lower case, blanks as hyphens, other marks left out.
     /^##+ / {
         label = tolower($0)
         sub(/^#+ /, "", label)
         gsub(/ /, "-", label)
         gsub(/[^a-z0-9_-]/, "", label)
-        $0 = $0 " {#" label "}"
+        gsub(/`/, "")  # a heading takes no markup
+        hashes = substr($0, 1, index($0, " "))
+        text = substr($0, length(hashes) + 1)
+        gsub(/[\\@<>%#&$]/, "\\\\&", text)
+        gsub(/--/, "\\--", text)
+        print hashes text " {#" label "}"
+        next
     }
-    { print spans($0) }
+    { print spans(links($0)) }
     ' "$1"
 }
 
