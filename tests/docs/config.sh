@@ -2,7 +2,7 @@
 # Reads each sample configuration with the sample program and compares where its messages went.
 # Usage: config.sh SAMPLES-DIR TRY-CONFIG   With UPDATE=1 the expected results are written instead.
 set -eu
-samples=$1 program=$2
+samples=$(realpath "$1") program=$(realpath "$2")
 root=$(mktemp -d)
 trap 'rm -rf "$root"' EXIT
 export TZ=UTC LC_ALL=C KORVEX_HOME="$root/home"
