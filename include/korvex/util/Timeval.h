@@ -1,11 +1,13 @@
 #pragma once
 
+#include <korvex/Export.h>
+
 #include <sys/time.h>
 
 #include <ctime>
 #include <string>
 
-inline namespace korvex {
+inline namespace KORVEX_EXPORT korvex {
 
 // A wall-clock instant: seconds and microseconds since the Unix epoch. Seconds keep to the signed
 // 32-bit range whatever the platform's time_t is: additions and the clock saturate at the largest

@@ -1,8 +1,9 @@
 #pragma once
 
+#include <korvex/Export.h>
 #include <korvex/util/Timeval.h>
 
-inline namespace korvex {
+inline namespace KORVEX_EXPORT korvex {
 
 // The moment from which the layouts' %r and %R count: when logging was initialised, or the first
 // call of this function if that came earlier. The same object every time, never destroyed; safe

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <korvex/Export.h>
 #include <korvex/util/Logger/LogLevel.h>
 
 #include <cstdarg>
@@ -7,7 +8,7 @@
 #include <string>
 #include <vector>
 
-inline namespace korvex {
+inline namespace KORVEX_EXPORT korvex {
 
 class CachedTm;
 class LogAppender;

@@ -1,5 +1,7 @@
 #pragma once
 
+#include <korvex/Export.h>
+
 // A program may well be built with -DDEBUG, or include a header that defines ERROR. The macros are
 // put aside while the enumerators are declared and come back afterwards, so that such a program
 // compiles as long as it does not name these levels itself; where it must, `LogLevel` values are
@@ -23,7 +25,7 @@
 #undef FATAL
 #undef EMERG
 
-inline namespace korvex {
+inline namespace KORVEX_EXPORT korvex {
 
 // How grave a message is. A message passes a channel when its level is greater than or equal to
 // the channel's minimum. Logger has no methods for NOTICE, ALERT and EMERG: they serve as minima.
