@@ -34,7 +34,7 @@ set(CPACK_VERBATIM_VARIABLES ON)
 # Files come out with these modes whatever the umask of whoever packs them.
 set(CPACK_INSTALL_DEFAULT_DIRECTORY_PERMISSIONS
   OWNER_READ OWNER_WRITE OWNER_EXECUTE GROUP_READ GROUP_EXECUTE WORLD_READ WORLD_EXECUTE)
-set(CPACK_PRE_BUILD_SCRIPTS ${PROJECT_SOURCE_DIR}/cmake/CompressManuals.cmake)
+set(CPACK_PRE_BUILD_SCRIPTS ${PROJECT_SOURCE_DIR}/cmake/Compress.cmake)
 set(CPACK_COMPONENTS_ALL runtime development tools documentation)
 set(CPACK_DEB_COMPONENT_INSTALL ON)
 
@@ -48,7 +48,8 @@ function(describe component name section description)
   string(TOUPPER ${component} upper)
   set(CPACK_DEBIAN_${upper}_PACKAGE_NAME ${name} PARENT_SCOPE)
   set(CPACK_DEBIAN_${upper}_PACKAGE_SECTION ${section} PARENT_SCOPE)
-  set(CPACK_COMPONENT_${upper}_DESCRIPTION "${PROJECT_DESCRIPTION}: ${description}" PARENT_SCOPE)
+  set(CPACK_DEBIAN_${upper}_DESCRIPTION "${PROJECT_DESCRIPTION}: ${description}
+ Start-up, logging, a record store, paths and files, threads and time values." PARENT_SCOPE)
 endfunction()
 describe(runtime ${runtime} libs "the shared library")
 describe(development libkorvex-dev libdevel "headers, the static library, CMake and pkg-config files")
@@ -56,9 +57,9 @@ describe(tools korvex-tools utils "command-line tools")
 describe(documentation korvex-doc doc "pages, samples and examples")
 
 set(CPACK_DEBIAN_RUNTIME_PACKAGE_SHLIBDEPS ON)
-set(CPACK_DEBIAN_RUNTIME_PACKAGE_GENERATE_SHLIBS ON)
 # Within one major version names are added: a program needs the version it was linked with, or a later.
-set(CPACK_DEBIAN_RUNTIME_PACKAGE_GENERATE_SHLIBS_POLICY ">=")
+set(CPACK_DEBIAN_PACKAGE_GENERATE_SHLIBS ON)
+set(CPACK_DEBIAN_PACKAGE_GENERATE_SHLIBS_POLICY ">=")
 
 # Whoever links the static library links what it needs.
 set(CPACK_DEBIAN_DEVELOPMENT_PACKAGE_DEPENDS
