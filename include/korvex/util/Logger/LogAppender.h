@@ -62,7 +62,9 @@ class LogAppender {
     // appender ("has no filename, assuming stderr"), in order. A second call finds nothing left.
     std::vector<const char*> settle();
 
-    // What it is configured to do.
+    // What it is configured to do. It writes to a file when it has a name for one and is not the
+    // root appender.
+    bool writesToFile() const;
     const Pathname& fileName() const { return _filename; }  // empty: none
     std::int64_t maxFileSize() const { return _maxSize; }   // bytes; 0 and below: never rotated
     std::uint32_t maxBackupIndex() const { return _maxBackupIndex; }
@@ -81,7 +83,6 @@ class LogAppender {
 
     friend class LoggingLocks;
 
-    bool writesToFile() const;
     void writeLine(const std::string& line, long long now, Report& report) KORVEX_REQUIRES(_mutex);
     void checkIdentity(long long now) KORVEX_REQUIRES(_mutex);
     bool openFile(Report& report) KORVEX_REQUIRES(_mutex);
