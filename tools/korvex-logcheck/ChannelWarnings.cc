@@ -13,7 +13,7 @@ bool isAppender(const std::string& word) {
 std::string destinationsOf(const Configuration& config, const Channel& channel) {
     std::vector<std::string> names;
     for (const LogAppender* const one : Configuration::destinations(*channel.made))
-        names.push_back(printable(config.nameOf(one)));
+        names.push_back(visible(config.nameOf(one)));
     return listed(names);
 }
 

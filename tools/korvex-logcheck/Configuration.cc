@@ -96,7 +96,7 @@ std::vector<std::string> Configuration::users(const LogAppender& appender) const
     };
     look(root, "the root");
     for (const Channel& category : categories)
-        look(category, printable(category.name));
+        look(category, visible(category.name));
     return names;
 }
 

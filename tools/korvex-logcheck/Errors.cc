@@ -1,5 +1,3 @@
-#include <cstring>
-
 #include "Findings.h"
 #include "Text.h"
 
@@ -8,15 +6,18 @@ namespace {
 // Why a category's value, or the root's, was not accepted.
 std::string explainWords(const std::string& value) {
     std::vector<std::string> bad;
-    bool lowerCase = false;
+    bool wrongCase = false;
+    bool hash = false;
     for (const std::string& word : wordsOf(value)) {
         if (isLevelWord(word) || LogAppender::find(word, false) != nullptr) continue;
         bad.push_back(quoted(word));
-        if (isLevelWord(word, true)) lowerCase = true;
+        wrongCase = wrongCase || isLevelWord(word, true);
+        hash = hash || word.back() == '#';
     }
     if (bad.empty()) return "";
     return listed(bad) + (bad.size() == 1 ? " is" : " are") + " neither a level nor an appender" +
-           (lowerCase ? "; levels are in upper case" : "");
+           (wrongCase ? "; levels are in upper case" : "") +
+           (hash ? "; a \"#\" right behind a word belongs to it" : "");
 }
 
 std::string explainAttribute(const ConfigStatement& said) {
@@ -28,13 +29,6 @@ std::string explainAttribute(const ConfigStatement& said) {
     }
     return "the attributes are fileName, maxFileSize, maxBackupIndex, layout and "
            "layout.ConversionPattern";
-}
-
-std::string explainLine(const std::string& context) {
-    for (const char* const key : {"rootCategory", "category", "appender"}) {
-        if (context.find(key) != context.npos) return "no \"=\" where it should be, or no name";
-    }
-    return "a line sets rootCategory, category.NAME or appender.NAME.ATTRIBUTE";
 }
 
 std::string explain(const Configuration& config, const DeferedLogConf& error) {
@@ -53,7 +47,8 @@ std::string explain(const Configuration& config, const DeferedLogConf& error) {
             if (said.lineno == error.lineno) return explainAttribute(said);
         }
     }
-    return explainLine(error.context);
+    return "lines are rootCategory=..., category.NAME=..., appender.NAME=... and "
+           "appender.NAME.ATTRIBUTE=...";
 }
 
 }  // namespace

@@ -20,14 +20,14 @@ void row(const std::string& label, const std::string& text, Ink ink = Ink::PLAIN
 }
 
 std::string placeOf(const LogAppender& appender) {
-    return appender.writesToFile() ? printable(appender.fileName()) : "standard error";
+    return appender.writesToFile() ? visible(appender.fileName()) : "standard error";
 }
 
 std::string destinations(const Configuration& config, const LogChannel& channel, bool places) {
     std::vector<std::string> all;
     for (const LogAppender* const one : Configuration::destinations(channel)) {
-        std::string name = printable(config.nameOf(one));
-        if (places) name += " (" + placeOf(*one) + ")";
+        std::string name = visible(config.nameOf(one));
+        if (places || one == config.rootAppender.made) name += " (" + placeOf(*one) + ")";
         all.push_back(name);
     }
     return listed(all);
@@ -80,11 +80,11 @@ Sample sampleOf(const Configuration& config, const LogAppender& appender) {
 
 void reportAppender(const Configuration& config, const Appender& appender) {
     const std::vector<std::string> users = config.users(*appender.made);
-    write("appender " + printable(appender.name), Ink::TITLE);
+    write("appender " + visible(appender.name), Ink::TITLE);
     write("\n");
     row("file", placeOf(*appender.made));
     row("limits", limitsOf(*appender.made));
-    row("layout", printable(appender.made->layout().pattern()));
+    row("layout", visible(appender.made->layout().pattern()));
     rowsOfSample(sampleOf(config, *appender.made));
     row("used by", users.empty() ? "nobody" : listed(users));
     write("\n");
@@ -99,7 +99,7 @@ std::string counted(std::size_t count, const std::string& what) {
 void reportAll(const Configuration& config) {
     reportChannelState(config, "root", *config.root.made);
     for (const Channel& category : config.categories)
-        reportChannelState(config, "category " + printable(category.name), *category.made);
+        reportChannelState(config, "category " + visible(category.name), *category.made);
     for (const Appender& appender : config.appenders)
         reportAppender(config, appender);
     const bool spokenOf = !config.rootAppender.attributes.empty();
@@ -111,7 +111,7 @@ void reportAll(const Configuration& config) {
 void reportChannel(const Configuration& config, const std::string& name) {
     const LogChannel& channel = *LogChannel::find(name, false);
     const bool own = &channel != config.root.made;
-    write("channel " + printable(name), Ink::TITLE);
+    write("channel " + visible(name), Ink::TITLE);
     write(own ? "\n" : ": no category of its own, so the root's\n");
     for (int i = DEBUG; i <= EMERG; ++i) {
         const auto level = static_cast<LogLevel>(i);

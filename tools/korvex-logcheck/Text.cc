@@ -18,6 +18,12 @@ std::string printable(std::string_view text) {
     return shown;
 }
 
+std::string visible(std::string_view text) {
+    const auto isBlank = [](char c) { return c == ' ' || c == '\t'; };
+    const bool clear = !text.empty() && !isBlank(text.front()) && !isBlank(text.back());
+    return clear ? printable(text) : quoted(text);
+}
+
 std::string quoted(std::string_view text) {
     return '"' + printable(text) + '"';
 }

@@ -7,6 +7,9 @@
 // Configured text for a terminal: control characters as \xHH, the rest as it stands.
 std::string printable(std::string_view text);
 
+// The same, in quotes where one could not see its ends: when it is empty or a blank is at one.
+std::string visible(std::string_view text);
+
 // "TEXT", printable.
 std::string quoted(std::string_view text);
 
