@@ -14,7 +14,7 @@ using testing::ElementsAre;
 using testing::IsEmpty;
 using testing::StartsWith;
 using testsupport::ChildResult;
-using testsupport::linesOf;
+using testsupport::outputLines;
 using testsupport::LogcheckToolTest;
 using testsupport::runInChild;
 
@@ -28,7 +28,7 @@ class LogcheckFindingsTest : public LogcheckToolTest {
         const ChildResult result = check(text);
         std::vector<std::string> all;
         bool errors = false;
-        for (const std::string& line : linesOf(result.out)) {
+        for (const std::string& line : outputLines(result.out)) {
             if (line.compare(0, file.size() + 1, file + ':') != 0) continue;
             all.push_back(line.substr(file.size() + 1));
             errors = errors || all.back().find(": error: ") != std::string::npos;
@@ -220,7 +220,7 @@ TEST_F(LogcheckFindingsTest, ItTellsWhatTheLibraryLogs) {
                              "appender.A.maxFileSize=7 \n log4cpp.x\nappender. =\n"
                              "<!-- a\n--> bad\n<!-- end";
     const std::vector<std::string> told = findings(text);
-    const std::vector<std::string> logged = linesOf(runInChild([&] {
+    const std::vector<std::string> logged = outputLines(runInChild([&] {
                                                         Logger::initialize(Pathname(file), {});
                                                         return 0;
                                                     }).err);

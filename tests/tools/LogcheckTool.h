@@ -35,7 +35,7 @@ class LogcheckToolTest : public testing::Test {
     const std::string file = dir.file("log.cfg");
 };
 
-inline std::vector<std::string> linesOf(const std::string& text) {
+inline std::vector<std::string> outputLines(const std::string& text) {
     std::vector<std::string> lines;
     std::istringstream in(text);
     for (std::string line; std::getline(in, line);)
