@@ -14,8 +14,8 @@ using testing::ElementsAre;
 using testing::IsEmpty;
 using testing::StartsWith;
 using testsupport::ChildResult;
-using testsupport::outputLines;
 using testsupport::LogcheckToolTest;
+using testsupport::outputLines;
 using testsupport::runInChild;
 
 // A whole appender, used by the root.
@@ -41,7 +41,7 @@ class LogcheckFindingsTest : public LogcheckToolTest {
 
 TEST_F(LogcheckFindingsTest, EveryParseErrorHasItsReason) {
     const std::string lines =
-        "; lines are rootCategory=..., category.NAME=..., appender.NAME=... and "
+        ": lines are rootCategory=..., category.NAME=..., appender.NAME=... and "
         "appender.NAME.ATTRIBUTE=...";
     const std::string attributes =
         ": the attributes are fileName, maxFileSize, maxBackupIndex, layout and "
@@ -55,8 +55,8 @@ TEST_F(LogcheckFindingsTest, EveryParseErrorHasItsReason) {
                          "category.y=Warn, A#\n"
                          "category.z=A, B, C\n"
                          "appender.rootAppender.bogus=1\n"),
-        ElementsAre("3: error: Parse error at \"rootcategory=INFO\"" + (":" + lines.substr(1)),
-                    "4: error: Parse error at \"x\"" + (":" + lines.substr(1)),
+        ElementsAre("3: error: Parse error at \"rootcategory=INFO\"" + lines,
+                    "4: error: Parse error at \"x\"" + lines,
                     "5: error: Parse error at \"appender.A.maxFileSize=10k\": \"10k\" is no plain "
                     "number: digits only, nothing behind them",
                     "6: error: Parse error at \"appender.A.layout=Simple\": the layouts are "
@@ -194,11 +194,14 @@ TEST_F(LogcheckFindingsTest, AttributesThatUndoEachOther) {
                 IsEmpty());
 }
 
-TEST_F(LogcheckFindingsTest, ALayoutThatCannotBeLaidOut) {
-    EXPECT_THAT(findings(kGood + "appender.A.layout.ConversionPattern=%d{%E%}%m%n\n"
+TEST_F(LogcheckFindingsTest, ALayoutThatMakesNoLines) {
+    EXPECT_THAT(findings(kGood + "appender.A.layout.ConversionPattern=%-4000000000m%n\n"
                                  "appender.rootAppender.layout.ConversionPattern=x\n"),
-                Contains("4: warning: the layout of \"rootAppender\" does not end in %n: its lines "
-                         "run into each other"));
+                ElementsAre("3: warning: the layout of \"A\" asks for a width of six digits",
+                            "4: warning: the layout of \"rootAppender\" does not end in %n: its "
+                            "lines run into each other"));
+    EXPECT_THAT(findings(kGood + "appender.A.layout.ConversionPattern=%99999m 123456%n\n"),
+                IsEmpty());
 }
 
 TEST_F(LogcheckFindingsTest, TheRootAppenderStaysWhereItIs) {
@@ -221,9 +224,9 @@ TEST_F(LogcheckFindingsTest, ItTellsWhatTheLibraryLogs) {
                              "<!-- a\n--> bad\n<!-- end";
     const std::vector<std::string> told = findings(text);
     const std::vector<std::string> logged = outputLines(runInChild([&] {
-                                                        Logger::initialize(Pathname(file), {});
-                                                        return 0;
-                                                    }).err);
+                                                            Logger::initialize(Pathname(file), {});
+                                                            return 0;
+                                                        }).err);
     EXPECT_EQ(logged.size(), 12U);
     for (std::string line : logged) {
         const bool error = line.compare(0, file.size() + 1, file + ':') == 0;

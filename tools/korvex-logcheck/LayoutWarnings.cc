@@ -39,8 +39,7 @@ void checkSample(const Configuration& config, const Appender& appender, Findings
     const Sample sample = sampleLine(*appender.made, "sample", *config.root.made);
     if (!sample.failure.empty()) {
         warn(to, lineno,
-             "the layout of " + quoted(appender.name) +
-                 " fails, so its messages go to standard error: " + printable(sample.failure));
+             "the layout of " + quoted(appender.name) + ' ' + printable(sample.failure));
     } else if (sample.line.empty() || sample.line.back() != '\n') {
         warn(to, lineno,
              "the layout of " + quoted(appender.name) +

@@ -56,7 +56,8 @@ std::string limitsOf(const LogAppender& appender) {
 }
 
 void rowsOfSample(const Sample& sample) {
-    if (!sample.failure.empty()) return row("sample", "none: " + sample.failure, Ink::WARNING);
+    if (!sample.failure.empty())
+        return row("sample", "none: the layout " + printable(sample.failure), Ink::WARNING);
     std::string line = sample.line;
     if (!line.empty() && line.back() == '\n') line.pop_back();
     const char* label = "sample";

@@ -6,7 +6,7 @@
 
 struct Sample {
     std::string line;     // as it would be written
-    std::string failure;  // why there is none; empty when all is well
+    std::string failure;  // what is wrong with the layout; empty: the line is there
 };
 
 // A message of now on the channel, at the least level that passes it and that a logger has a method
