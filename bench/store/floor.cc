@@ -20,10 +20,10 @@ void append(std::string& out, const std::string& field) {
 
 class Floor {
   public:
-    explicit Floor(const std::string& path) : _path(path) {}
+    void open(const std::string& path) { _path = path; }
 
     void load() {
-        const int fd = open(_path.c_str(), O_RDONLY);
+        const int fd = ::open(_path.c_str(), O_RDONLY);
         struct stat st;
         if (fd < 0 || fstat(fd, &st) != 0) bench::giveUp("cannot open the store");
         const auto size = static_cast<std::size_t>(st.st_size);
@@ -44,7 +44,7 @@ class Floor {
             append(out, key);
             append(out, value);
         }
-        const int fd = open(_path.c_str(), O_WRONLY | O_CREAT | O_TRUNC, 0600);
+        const int fd = ::open(_path.c_str(), O_WRONLY | O_CREAT | O_TRUNC, 0600);
         if (write(fd, out.data(), out.size()) != static_cast<ssize_t>(out.size()))
             bench::giveUp("cannot write the store");
         close(fd);

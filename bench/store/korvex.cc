@@ -11,7 +11,7 @@ void release(void* p) {
 
 class Korvex {
   public:
-    explicit Korvex(const std::string& path) { _store.setDBFile(path); }
+    void open(const std::string& path) { _store.setDBFile(path); }
 
     void load() { _store.readFile(); }
     void hold(const bench::Map& all) {

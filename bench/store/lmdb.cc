@@ -18,7 +18,7 @@ std::string text(const MDB_val& val) {
 
 class Lmdb : public bench::Holder {
   public:
-    explicit Lmdb(const std::string& path) {
+    void open(const std::string& path) {
         check(mdb_env_create(&_env));
         check(mdb_env_set_mapsize(_env, std::size_t{1} << 30));
         check(mdb_env_open(_env, path.c_str(), MDB_NOSUBDIR | MDB_NOSYNC, 0600));
@@ -30,6 +30,7 @@ class Lmdb : public bench::Holder {
         check(mdb_cursor_open(_reading, _dbi, &_cursor));
         mdb_txn_reset(_reading);
     }
+    Lmdb() = default;
     Lmdb(const Lmdb&) = delete;
     ~Lmdb() {
         mdb_cursor_close(_cursor);
@@ -42,7 +43,7 @@ class Lmdb : public bench::Holder {
         MDB_val key;
         MDB_val value;
         while (mdb_cursor_get(_cursor, &key, &value, MDB_NEXT) == 0)
-            held.emplace_hint(held.end(), text(key), text(value));
+            held[text(key)] = text(value);
         mdb_txn_reset(_reading);
     }
     void save() {

@@ -2,7 +2,7 @@
 
 // The rows of the store's table, over a contestant: a class with
 //
-//     explicit C(const std::string& path);       // a store at that path; made if absent
+//     void open(const std::string& path);        // a store at that path; made if absent
 //     void load();                               // all its records into memory
 //     void hold(const Map&);                     // has these records in memory, as load() leaves
 //     it void save();                               // everything it holds, into an empty store
@@ -85,8 +85,9 @@ std::string storeOf(unsigned n) {
     if (std::filesystem::exists(path + ".made")) return path;
     inChild([&] {  // so that making it is not seen in this process's peak
         removeStore(path);
-        C store(path);
+        C store;
         store.hold(records(n));
+        store.open(path);
         store.save();
         return 0.0;
     });
@@ -95,26 +96,42 @@ std::string storeOf(unsigned n) {
 }
 
 template <class C>
-double loadOnce(const std::string& warm, const std::string& path) {
-    C(warm).load();  // brings in the code, and what is done once in a process
+double loadOnce(const std::string& path) {
+    C store;
     const std::uint64_t begin = now();
-    C store(path);
+    store.open(path);
     store.load();
     return static_cast<double>(now() - begin);
 }
 
 template <class C>
-double saveOnce(const Map& all) {
-    removeStore("warm");
-    removeStore("saved");
-    C warm("warm");
-    warm.hold({*all.begin()});
-    warm.save();
-    const auto store = std::make_unique<C>("saved");
-    store->hold(all);
+double saveOnce(const Map& all, const std::string& path) {
+    removeStore(path);
+    C store;
+    store.hold(all);
     const std::uint64_t begin = now();
-    store->save();
+    store.open(path);
+    store.save();
     return static_cast<double>(now() - begin);
+}
+
+// In a child process each, since a process loads its store once. A store of one record goes first:
+// it brings in the code, and what is done once in a process.
+template <class C>
+double loads(unsigned n, const std::string& path) {
+    const std::string warm = storeOf<C>(1);
+    return inChildren(n, [&] {
+        loadOnce<C>(warm);
+        return loadOnce<C>(path);
+    });
+}
+
+template <class C>
+double saves(unsigned n, const Map& all) {
+    return inChildren(n, [&] {
+        saveOnce<C>({*all.begin()}, "warm");
+        return saveOnce<C>(all, "saved");
+    });
 }
 
 template <class C>
@@ -123,27 +140,24 @@ int storeMain(int argc, char** argv) {
     const Row row(argv[1]);
     const auto n = static_cast<unsigned>(std::strtoul(argv[2], nullptr, 10));
     if (row.name == "save") {
-        const Map all = records(row.number);
-        report("ns", inChildren(n, [&] { return saveOnce<C>(all); }) / row.number);
+        report("ns", saves<C>(n, records(row.number)) / row.number);
         return 0;
     }
     const std::string path = storeOf<C>(row.number);
     if (row.name == "load") {
-        const std::string warm = storeOf<C>(1);
-        report("ns", inChildren(n, [&] { return loadOnce<C>(warm, path); }) / row.number);
-    } else if (row.name == "memory") {
-        C store(path);
-        store.load();
+        report("ns", loads<C>(n, path) / row.number);
+        return 0;
+    }
+    C store;
+    store.open(path);
+    store.load();
+    if (row.name == "memory") {
         report("mib", peakMiB());
     } else if (row.name == "put") {
-        C store(path);
-        store.load();
         const std::vector<std::string> keys = randomKeys(n, row.number);
         const std::string bytes = value(7);
         report("ns", perCall(n, [&](unsigned i) { store.putAndSave(keys[i], bytes); }));
     } else {
-        C store(path);
-        store.load();
         const bool get = row.name == "get";
         const std::vector<std::string> keys = randomKeys(n, row.number, get ? 16 : 15);
         std::size_t sum = 0;
