@@ -33,10 +33,10 @@ std::string withErrorText(const char* fmt, int errnum) {
     return result += fmt;
 }
 
-void formatPlain(std::string& out, const char* fmt, va_list ap)
+void formatByPrintf(std::string& out, const char* fmt, va_list ap)
     __attribute__((format(printf, 2, 0)));
 
-void formatPlain(std::string& out, const char* fmt, va_list ap) {
+void formatByPrintf(std::string& out, const char* fmt, va_list ap) {
     const PrintfBuffer text(fmt, ap);
     // Better the bare format than a line lost to an argument that cannot be shown.
     if (text.ok()) {
@@ -52,9 +52,9 @@ void Logger::vformat(std::string& out, int errnum, const char* fmt, va_list ap) 
     const ErrnoKeeper keeper;
     errno = errnum;  // for glibc's own %m, which "%-40m" is
     if (std::strstr(fmt, "%m") == nullptr) {
-        formatPlain(out, fmt, ap);
+        formatByPrintf(out, fmt, ap);
     } else {
-        formatPlain(out, withErrorText(fmt, errnum).c_str(), ap);
+        formatByPrintf(out, withErrorText(fmt, errnum).c_str(), ap);
     }
 }
 

@@ -1,5 +1,6 @@
 #include <korvex/util/Logger.h>
 
+#include "base/ThreadText.h"
 #include "util/Logger/AppenderReport.h"
 #include "util/Logger/NologLock.h"
 #include "util/Logger/RootObjects.h"
@@ -37,12 +38,12 @@ const LogFormat& LogAppender::layout() const {
 }
 
 void LogAppender::write(const LogMsgMetadata& mdata, const std::string& msg) {
-    std::string m;
-    layout().apply(m, mdata, msg);
+    ThreadText m;
+    layout().apply(*m, mdata, msg);
     Report report(this);
     {
         const NologLock lock(_mutex);
-        writeLine(m, mdata.stamp.sec(), report);
+        writeLine(*m, mdata.stamp.sec(), report);
     }
     report.deliver();
 }

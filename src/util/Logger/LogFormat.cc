@@ -4,7 +4,7 @@
 #include "base/Assert.h"
 #include "util/Logger/LogFormatCompiler.h"
 
-#include <cstdio>
+#include <charconv>
 #include <cstring>
 #include <ctime>
 
@@ -35,9 +35,18 @@ class LogFormat::Line {
     Line(std::string& out, const LogMsgMetadata& md, const std::string& msg)
         : _out(out), _md(md), _msg(msg) {}
 
-    void append(const Atom& atom) { fit(atom, text(atom)); }
+    void append(const Atom& atom) {
+        if (atom.what == Atom::TIME_FMT && atom.minw == 0 && isUnlimited(atom)) {
+            atom.arg.fdate->fmt(_out, _tm, _md);
+        } else {
+            fit(atom, text(atom));
+        }
+    }
 
   private:
+    // All bits set is no limit, even for a text of 4 GiB and more.
+    static bool isUnlimited(const Atom& atom) { return atom.maxw == static_cast<unsigned>(-1); }
+
     Text text(const Atom& atom);
     Text category() const;
     Text level() const;
@@ -50,7 +59,7 @@ class LogFormat::Line {
     const std::string& _msg;
     CachedTm _tm;  // so that every date of the line shows the same local time
     std::string _dateText;
-    char _digits[21];
+    char _digits[20];  // of 64 bits
 };
 
 Text LogFormat::Line::text(const Atom& atom) {
@@ -91,10 +100,8 @@ Text LogFormat::Line::level() const {
 }
 
 Text LogFormat::Line::number(unsigned long long value) {
-    const auto elen =
-        static_cast<unsigned long>(std::snprintf(_digits, sizeof _digits, "%llu", value));
-    KORVEX_ASSERT_AS(elen < sizeof _digits, "elen < sizeof(buf)");
-    return {_digits, elen};
+    const char* const end = std::to_chars(_digits, _digits + sizeof _digits, value).ptr;
+    return {_digits, static_cast<unsigned long>(end - _digits)};
 }
 
 Text LogFormat::Line::date(const LogFormattedDate& layout) {
@@ -106,12 +113,14 @@ Text LogFormat::Line::date(const LogFormattedDate& layout) {
 // A text that was cut is not padded, whatever its minimum.
 void LogFormat::Line::fit(const Atom& atom, const Text& text) {
     if (atom.maxw < text.size) {
-        // All bits set is no limit, even for a text of 4 GiB and more.
-        const bool unlimited = atom.maxw == static_cast<unsigned int>(-1);
-        _out.append(text.data, unlimited ? text.size : atom.maxw);
+        _out.append(text.data, isUnlimited(atom) ? text.size : atom.maxw);
         return;
     }
-    const unsigned long padding = text.size < atom.minw ? atom.minw - text.size : 0;
+    if (text.size >= atom.minw) {
+        _out.append(text.data, text.size);
+        return;
+    }
+    const unsigned long padding = atom.minw - text.size;
     if (atom.justify != 0) _out.append(padding, atom.justify);
     _out.append(text.data, text.size);
     if (atom.justify == 0) _out.append(padding, ' ');

@@ -2,6 +2,8 @@
 
 #include "base/ErrnoKeeper.h"
 #include "base/NeverDestroyed.h"
+#include "base/PlainFormat.h"
+#include "base/ThreadText.h"
 #include "util/Logger/EarlyLoggers.h"
 #include "util/Logger/FallbackToStderr.h"
 #include "util/Logger/Reporting.h"
@@ -30,12 +32,13 @@ void deliver(LogChannel* channel, const Logger* logger, LogLevel level,
     lastResort(level, text);
 }
 
+// Into an empty text, which is no argument.
 bool formatInto(std::string& text, int errnum, const char* fmt, va_list ap) noexcept
     __attribute__((format(printf, 3, 0)));
 
 bool formatInto(std::string& text, int errnum, const char* fmt, va_list ap) noexcept {
     try {
-        Logger::vformat(text, errnum, fmt, ap);
+        if (!formatPlain(text, fmt, ap)) Logger::vformat(text, errnum, fmt, ap);
         return true;
     } catch (...) {
         return false;
@@ -73,8 +76,8 @@ void LogFormat::do_log(Logger* logger, LogLevel level, const char* fmt, va_list 
         channel = &logger->channel();
         if (!channel->passes(level)) return;
     }
-    std::string text;
-    if (formatInto(text, keeper.saved(), fmt, ap)) deliver(channel, logger, level, text);
+    ThreadText text;
+    if (formatInto(*text, keeper.saved(), fmt, ap)) deliver(channel, logger, level, *text);
 }
 
 void LogFormat::internal(const LogAppender* skip, LogLevel level, const char* fmt, ...) noexcept {
@@ -85,16 +88,16 @@ void LogFormat::internal(const LogAppender* skip, LogLevel level, const char* fm
     if (!channel.passes(level)) return;
     va_list ap;
     va_start(ap, fmt);
-    std::string text;
-    const bool formatted = formatInto(text, keeper.saved(), fmt, ap);
+    ThreadText text;
+    const bool formatted = formatInto(*text, keeper.saved(), fmt, ap);
     va_end(ap);
     if (!formatted) return;
     const ReportingMark mark(skip);
     try {
-        if (channel.write(LogMsgMetadata(&int_logger, level), text, skip)) return;
+        if (channel.write(LogMsgMetadata(&int_logger, level), *text, skip)) return;
     } catch (...) {  // as in deliver()
     }
-    lastResort(level, text);
+    lastResort(level, *text);
 }
 
 }  // namespace korvex

@@ -3,10 +3,12 @@
 #include <gtest/gtest.h>
 
 #include <cerrno>
+#include <climits>
 #include <cstdlib>
 #include <cstring>
 #include <ctime>
 #include <new>
+#include <random>
 #include <stdexcept>
 #include <string>
 
@@ -85,8 +87,8 @@ TEST_F(LogFormattedDateTest, MillisecondsHaveThreeDigitsAndAreCut) {
     const struct {
         int usec;
         const char* text;
-    } all[] = {{0, "000"},     {999, "000"},    {1000, "001"},
-               {99999, "099"}, {100000, "100"}, {999999, "999"}};
+    } all[] = {{0, "000"},      {999, "000"},     {1000, "001"},  {99999, "099"},   {100000, "100"},
+               {999999, "999"}, {1234567, "123"}, {-1000, "429"}, {12345678, "123"}};
     for (const auto& expected : all) {
         setStamp(expected.usec);
         EXPECT_EQ(date("%l"), expected.text) << expected.usec;
@@ -117,6 +119,7 @@ TEST_F(LogFormattedDateTest, PiecesAroundTheLocalBufferComeOutWhole) {
     for (const std::size_t n : {62U, 63U, 64U, 65U, 127U, 128U, 129U, 10000U}) {
         const std::string text(n, 'x');
         EXPECT_EQ(date((text + "%l" + text + "%H").c_str()), text + "007" + text + "14") << n;
+        EXPECT_EQ(date((text + "%P%l" + text + "%I").c_str()), text + "pm007" + text + "02") << n;
     }
 }
 
@@ -135,11 +138,49 @@ TEST_F(LogFormattedDateTest, AnAmPmThatIsNotEmptyPrints) {
 }
 
 TEST_F(LogFormattedDateTest, APieceThatIsEmptyForAnotherReasonThrowsInsteadOfTakingAllMemory) {
-    for (const char* layout : {"%P", "%pm", " %p", "%p%", "%Z", "%_-p", "%EOp", "%p%l%H"}) {
+    for (const char* layout : {"%P", "%pm", " %p", "%p%", "%Z", "%_-p", "%EOp", "%p%l%j"}) {
         const FailNth empty(Call::strftime, 1, EINVAL, FailNth::FROM_THEN_ON);
         EXPECT_THROW(date(layout), std::length_error) << layout;
         EXPECT_LT(empty.count(), 40U) << layout;
     }
+}
+
+// Not the least: each number on both sides of its one-digit values, and leap seconds' neighbours.
+TEST_F(LogFormattedDateTest, NumbersComeOutAsStrftimeWritesThem) {
+    constexpr char pattern[] = "<%Y-%m-%dT%H:%M:%S>%Y%d";
+    std::mt19937 random(1);
+    std::uniform_int_distribution<int> any(INT_MIN, INT_MAX);
+    for (int i = 0; i < 5000; ++i) {
+        const int sec = i == 0 ? INT_MIN : i == 1 ? INT_MAX : i < 1000 ? i * 86400 : any(random);
+        _md.stamp = at(sec, 0);
+        struct tm local {};
+        _md.stamp.localtime(local);
+        char expected[64];
+        ASSERT_NE(std::strftime(expected, sizeof expected, pattern, &local), 0U);
+        ASSERT_EQ(date(pattern), expected) << sec;
+    }
+}
+
+TEST_F(LogFormattedDateTest, NumbersTakeNoStrftime) {
+    const CountCalls calls(Call::strftime);
+    EXPECT_EQ(date("%d.%m.%Y %H:%M:%S,%l"), "05.03.2007 14:03:09,007");
+    EXPECT_EQ(calls.count(), 0U);
+    EXPECT_EQ(date("%d.%m.%y"), "05.03.07");
+    EXPECT_EQ(calls.count(), 1U);
+}
+
+TEST_F(LogFormattedDateTest, ALineFollowsAChangeOfTheZoneWithinTheSecond) {
+    EXPECT_EQ(date("ISO8601"), "2007-03-05 14:03:09,007");
+    setenv("TZ", "XYZ+1", 1);
+    tzset();
+    EXPECT_EQ(date("ISO8601"), "2007-03-05 07:33:09,007");
+    // The same names and offsets, but other rules.
+    setenv("TZ", "AAA0BBB,M6.1.0,M7.1.0", 1);
+    tzset();
+    EXPECT_EQ(date("%H"), "08");
+    setenv("TZ", "AAA0BBB,M3.1.0,M7.1.0", 1);
+    tzset();
+    EXPECT_EQ(date("%H"), "09");
 }
 
 TEST_F(LogFormattedDateTest, APieceEndsAtItsFirstNul) {
@@ -151,7 +192,7 @@ TEST_F(LogFormattedDateTest, APieceEndsAtItsFirstNul) {
 TEST_F(LogFormattedDateTest, AGrownBufferServesTheLaterPieces) {
     const std::string longPiece(200, 'x');
     const CountCalls calls(Call::strftime);
-    date((longPiece + "%l" + longPiece).c_str());
+    date((longPiece + "%j%l" + longPiece + "%j").c_str());
     EXPECT_EQ(calls.count(), 4U) << "64, 128 and 256 bytes, then 256 at once";
 }
 

@@ -12,9 +12,10 @@ class LogMsgMetadata;
 // Belongs to one thread and one message.
 class CachedTm {
   public:
-    // strftime(3) of the message's stamp as local time: the length written, or 0 when `size` does
-    // not suffice. The first call converts md.stamp; later calls do not look at md again. Aborts
-    // when the conversion fails, as Timeval::localtime does.
+    // The message's stamp as local time. The first call converts md.stamp; later calls do not look
+    // at md again. Aborts when the conversion fails, as Timeval::localtime does.
+    const struct tm& get(const LogMsgMetadata& md);
+    // strftime(3) of that: the length written, or 0 when `size` does not suffice.
     unsigned long ftime(char* buf, unsigned long size, const char* fmt, const LogMsgMetadata& md);
 
   private:
@@ -46,9 +47,9 @@ class LogFormattedDate {
 
   private:
     struct Atom {
-        enum What { STRFTIME = 0, MSEC = 1 };
+        enum What { STRFTIME = 0, MSEC = 1, NUMBERS = 2 };
         What what;
-        std::string strft_fmt;  // STRFTIME: the piece, as a pattern for strftime(3)
+        std::string strft_fmt;  // STRFTIME, NUMBERS: the piece, as a pattern for strftime(3)
         bool may_be_empty;      // STRFTIME: the piece is empty or made of %p alone
         unsigned long limit;    // STRFTIME: no output of the piece can be as long as this
     };

@@ -1,0 +1,128 @@
+#include "base/ThreadText.h"
+
+#include <gtest/gtest.h>
+#include <pthread.h>
+
+#include <cerrno>
+#include <memory>
+#include <string>
+#include <thread>
+
+#include "support/Child.h"
+#include "support/Faults.h"
+
+namespace {
+
+using testsupport::Call;
+using testsupport::CountCalls;
+using testsupport::FailNth;
+
+const std::string kLong(1000, 'x');
+
+// A thread of its own begins without any texts. Where allocations are counted, those of the thread
+// itself are over.
+template <class Body>
+void inOwnThread(Body body) {
+    std::thread(body).join();
+}
+
+TEST(ThreadTextTest, TheSecondTextNeedsNoMemory) {
+    inOwnThread([] {
+        *ThreadText() = kLong;
+        const CountCalls allocations(Call::allocation);
+        for (int i = 0; i < 10; ++i) {
+            ThreadText text;
+            EXPECT_EQ(*text, "");
+            *text = kLong;
+        }
+        EXPECT_EQ(allocations.count(), 0U);
+    });
+}
+
+TEST(ThreadTextTest, TextsInUseAtOnceAreDifferentOnesHoweverMany) {
+    inOwnThread([] {
+        for (int round = 0; round < 2; ++round) {
+            std::unique_ptr<ThreadText> texts[9];
+            for (int i = 0; i < 9; ++i) {
+                texts[i] = std::make_unique<ThreadText>();
+                **texts[i] = std::string(1, static_cast<char>('0' + i));
+            }
+            for (int i = 9; i-- > 0;) {
+                EXPECT_EQ(**texts[i], std::string(1, static_cast<char>('0' + i)));
+                texts[i].reset();
+            }
+        }
+    });
+}
+
+TEST(ThreadTextTest, WhatGrewBeyondAllMeasureIsGivenBack) {
+    inOwnThread([] {
+        std::size_t kept = 0;
+        for (const std::size_t size : {16384U, 16385U}) {
+            { (*ThreadText()).reserve(size); }
+            kept = (*ThreadText()).capacity();
+            EXPECT_EQ(kept >= 16384, size == 16384) << kept;
+        }
+    });
+}
+
+TEST(ThreadTextTest, WithoutMemoryOrAKeyItIsATextLikeAnyOther) {
+    for (const Call call : {Call::allocation, Call::pthread_setspecific}) {
+        inOwnThread([call] {
+            {
+                const FailNth fault(call, 1, ENOMEM);
+                ThreadText text;
+                *text = "short";
+                EXPECT_EQ(*text, "short");
+                EXPECT_TRUE(fault.fired());
+            }
+            const CountCalls allocations(Call::allocation);
+            *ThreadText() = kLong;
+            *ThreadText() = kLong;
+            EXPECT_EQ(allocations.count(), 2U) << "nothing is kept from now on";
+        });
+    }
+}
+
+TEST(ThreadTextTest, WithoutAKeyNoThreadKeepsAny) {
+    constexpr int kTooLate = 77;
+    const auto result = testsupport::runInChild([] {
+        const FailNth fault(Call::pthread_key_create, 1, EAGAIN);
+        *ThreadText() = kLong;
+        if (!fault.fired()) return kTooLate;
+        int kept = 0;
+        std::thread([&] {
+            *ThreadText() = kLong;
+            const CountCalls allocations(Call::allocation);
+            *ThreadText() = kLong;
+            kept = allocations.count() == 0 ? 1 : 0;
+        }).join();
+        return kept;
+    });
+    if (result.status == kTooLate) GTEST_SKIP() << "this process has made its key already";
+    EXPECT_EQ(result.status, 0);
+}
+
+// The order in which a thread's keys are destroyed is open.
+TEST(ThreadTextTest, AnEndingThreadMayStillUseOne) {
+    static int used = 0;
+    const auto use = [](void*) {
+        *ThreadText() = kLong;
+        ++used;
+    };
+    pthread_key_t before = 0;
+    pthread_key_t after = 0;
+    ASSERT_EQ(pthread_key_create(&before, use), 0);
+    inOwnThread([] { *ThreadText() = kLong; });
+    ASSERT_EQ(pthread_key_create(&after, use), 0);
+    inOwnThread([=] {
+        pthread_setspecific(before, &used);
+        pthread_setspecific(after, &used);
+        *ThreadText() = kLong;
+    });
+    EXPECT_EQ(used, 2);
+    pthread_key_delete(before);
+    pthread_key_delete(after);
+}
+
+}  // namespace
