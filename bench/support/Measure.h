@@ -14,6 +14,13 @@
 #include <string>
 #include <vector>
 
+#if __has_include(<valgrind/callgrind.h>)
+#include <valgrind/callgrind.h>
+#define BENCH_TOGGLE_COUNTING CALLGRIND_TOGGLE_COLLECT
+#else
+#define BENCH_TOGGLE_COUNTING static_cast<void>(0)
+#endif
+
 namespace bench {
 
 constexpr int kUnsupported = 3;  // exit status: this contestant cannot do that row
@@ -39,13 +46,16 @@ inline void report(const char* name, double value) {
     std::exit(1);
 }
 
-// Nanoseconds of one of n calls of work(i).
+// Nanoseconds of one of n calls of work(i). Under callgrind only these calls are counted.
 template <class Work>
 double perCall(unsigned n, Work work) {
+    BENCH_TOGGLE_COUNTING;
     const std::uint64_t begin = now();
     for (unsigned i = 0; i < n; ++i)
         work(i);
-    return static_cast<double>(now() - begin) / n;
+    const std::uint64_t end = now();
+    BENCH_TOGGLE_COUNTING;
+    return static_cast<double>(end - begin) / n;
 }
 
 inline double quantile(std::vector<double> values, double q) {
