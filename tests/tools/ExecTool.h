@@ -9,6 +9,9 @@ namespace testsupport {
 // tests are for another machine. Returns only when that failed.
 void execTool(const std::vector<std::string>& arguments);
 
+// The same with korvex-logcheck.
+void execLogcheck(const std::vector<std::string>& arguments);
+
 // Whether the tests run in an emulator, which has its limits: it knows no ptrace, for one.
 bool isEmulated();
 
