@@ -4,7 +4,7 @@
 #include <korvex/util/Logger/LogLevel.h>
 
 #include <cstdarg>
-#include <memory>
+#include <list>
 #include <string>
 #include <vector>
 
@@ -93,7 +93,7 @@ class LogFormat {
 
     std::string _fmt;
     std::vector<Atom> _atoms;
-    std::vector<std::unique_ptr<const LogFormattedDate>> _dates;
+    std::list<LogFormattedDate> _dates;
 };
 
 }  // namespace korvex
