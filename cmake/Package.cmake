@@ -62,8 +62,12 @@ set(CPACK_DEBIAN_PACKAGE_GENERATE_SHLIBS ON)
 set(CPACK_DEBIAN_PACKAGE_GENERATE_SHLIBS_POLICY ">=")
 
 # Whoever links the static library links what it needs.
+set(xml_dev libxml2-dev)
+if(KORVEX_XMLWRAPP STREQUAL "system")
+  set(xml_dev libxmlwrapp-dev)
+endif()
 set(CPACK_DEBIAN_DEVELOPMENT_PACKAGE_DEPENDS
-  "${runtime} ${same_version}, libpopt-dev, libxml2-dev, libc6-dev, pkgconf | pkg-config")
+  "${runtime} ${same_version}, libpopt-dev, ${xml_dev}, libc6-dev, pkgconf | pkg-config")
 set(CPACK_DEBIAN_DEVELOPMENT_PACKAGE_SUGGESTS "cmake, korvex-doc")
 
 set(CPACK_DEBIAN_TOOLS_PACKAGE_SHLIBDEPS ON)

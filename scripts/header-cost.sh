@@ -37,8 +37,8 @@ int main() {
 }
 END
 # shellcheck disable=SC2046,SC2086  # lists of flags
-"$cxx" $flags -O2 "$work/hello.cc" -o "$work/hello" "$build/src/libkorvex.a" \
-    $(pkg-config --libs popt libxml-2.0) -Wl,--as-needed
+"$cxx" $flags -O2 "$work/hello.cc" -o "$work/hello" -Wl,--as-needed "$build/src/libkorvex.a" \
+    $(pkg-config --libs popt libxml-2.0)
 "$work/hello" 2>&1 | grep -qx hello
 strip "$work/hello"
 echo "static hello, stripped: $(stat -c %s "$work/hello") bytes; of text: $(size "$work/hello" | awk 'NR == 2 { print $1 }')"

@@ -36,6 +36,14 @@ root_with() {
 # The tools, where there is no compiler and no other file of ours.
 test_tools() {
     root_with plain "$abi" korvex-tools
+    local completion
+    for completion in tools/*/completion/*; do
+        case ${completion##*/} in
+            '*') ;;
+            *.bash) [ -s "$here/plain/usr/share/bash-completion/completions/$(basename "$completion" .bash)" ] ;;
+            *) [ -s "$here/plain/usr/share/zsh/vendor-completions/${completion##*/}" ] ;;
+        esac
+    done
     # shellcheck disable=SC2016  # the inner shell's own dollars
     inside "$here/plain" env ABI="$abi" VERSION="$version" sh -euc '
         ldconfig -p | grep -q "libkorvex.so.${ABI#libkorvex} "
@@ -55,7 +63,7 @@ test_tools() {
         done
         [ -s /usr/share/doc/korvex-tools/examples/korvex.logrotate ]
         [ -s "/usr/share/doc/$ABI/copyright" ]
-        dpkg -s korvex-tools | grep -q "^Depends:.*$ABI"
+        dpkg -s korvex-tools | grep -q "^Depends:.*$ABI (>= $VERSION)"
         apt-get purge -y -qq korvex-tools "$ABI"
         ! find /usr /etc /var/lib/korvex* -name "*korvex*" 2> /dev/null | grep .' >> "$log" 2>&1
     say "the tools run, and leave nothing behind"
@@ -79,6 +87,18 @@ use_all() {
     done
 }
 
+# Each example is a project of its own, to be copied out of the package.
+build_examples() {
+    local example name
+    for example in examples/*/CMakeLists.txt; do
+        [ -e "$example" ] || return 0
+        name=$(basename "${example%/*}")
+        inside "$here/development" sh -euc 'cp -r "/usr/share/doc/korvex-doc/examples/$0" /tmp/ && cd "/tmp/$0" &&
+            cmake -B build && cmake --build build' "$name" >> "$log" 2>&1
+        say "example: $name"
+    done
+}
+
 # wants VERSION: whether find_package is content with it.
 wants() {
     inside "$here/development" sh -c '
@@ -91,6 +111,7 @@ root_with development "$abi" libkorvex-dev korvex-doc g++ cmake ninja-build
 mkdir "$here/development/korvex"
 git ls-files -z | tar -c --null -T - | tar -x -C "$here/development/korvex"
 use_all "no xmlwrapp"
+build_examples
 inside "$here/development" /korvex/tests/checks/exports.sh "/usr/lib/$(uname -m)-linux-gnu/libkorvex.so"
 for other in 0.9 1.99 2.0; do
     ! wants $other || { say "$other is content with $version"; exit 1; }

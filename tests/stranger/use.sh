@@ -28,6 +28,6 @@ case $way in
 esac
 
 "$build/stranger" > "$build/out" 2>&1
-printf 'hello from Main Thread\nstranger\n' | diff - "$build/out"
+printf '%s\n' 'hello from Main Thread' 'hello from worker' 'Main Thread created twice!' stranger | diff - "$build/out"
 linked=$(ldd "$build/stranger" | grep -c 'libkorvex\.so\.1 ' || true)
 [ "$linked" = "$([ "$kind" = shared ] && echo 1 || echo 0)" ]
