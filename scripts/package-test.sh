@@ -47,7 +47,8 @@ test_tools() {
     # shellcheck disable=SC2016  # the inner shell's own dollars
     inside "$here/plain" env ABI="$abi" VERSION="$version" sh -euc '
         ldconfig -p | grep -q "libkorvex.so.${ABI#libkorvex} "
-        [ ! -e /usr/include/korvex ] && [ ! -e /usr/share/doc/korvex-doc ]
+        [ ! -e /usr/include/korvex ]
+        [ ! -e /usr/share/doc/korvex-doc ]
         export KORVEX_HOME=/tmp/home KORVEX_DB=/tmp/db
         mkdir -p /tmp/home/etc /tmp/db/hashDb
         echo log4cpp.rootCategory=ERROR > /tmp/home/etc/log-cmdline.cfg
@@ -94,7 +95,7 @@ build_examples() {
         [ -e "$example" ] || return 0
         name=$(basename "${example%/*}")
         inside "$here/development" sh -euc 'cp -r "/usr/share/doc/korvex-doc/examples/$0" /tmp/ && cd "/tmp/$0" &&
-            cmake -B build && cmake --build build' "$name" >> "$log" 2>&1
+            cmake -B build -G Ninja && cmake --build build' "$name" >> "$log" 2>&1
         say "example: $name"
     done
 }
@@ -103,7 +104,7 @@ build_examples() {
 wants() {
     inside "$here/development" sh -c '
         mkdir /tmp/wants && cd /tmp/wants && printf "%s\n" "cmake_minimum_required(VERSION 3.20)" \
-            "project(Wants CXX)" "find_package(Korvex $0 REQUIRED)" > CMakeLists.txt && cmake .' "$1" >> "$log" 2>&1
+            "project(Wants CXX)" "find_package(Korvex $0 REQUIRED)" > CMakeLists.txt && cmake -G Ninja .' "$1" >> "$log" 2>&1
 }
 
 test_tools
