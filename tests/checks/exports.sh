@@ -1,6 +1,6 @@
 #!/bin/sh
-# Checks that a shared library shows the names in exports.txt and no other; the list holds for g++ on
-# x86-64. With --update, writes the list. Usage: exports.sh LIBRARY [--update]
+# Checks that a shared library shows the names in exports.txt and no other; the list holds for g++
+# and clang++ on x86-64. With --update, writes the list. Usage: exports.sh LIBRARY [--update]
 set -eu
 list=$(dirname "$0")/exports.txt
 shown() { nm -D -C --defined-only "$1" | sed 's/^[0-9a-f]* . //' | LC_ALL=C sort -u; }

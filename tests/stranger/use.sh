@@ -30,4 +30,5 @@ esac
 "$build/stranger" > "$build/out" 2>&1
 printf '%s\n' 'hello from Main Thread' 'hello from worker' 'Main Thread created twice!' stranger | diff - "$build/out"
 linked=$(ldd "$build/stranger" | grep -c 'libkorvex\.so\.1 ' || true)
-[ "$linked" = "$([ "$kind" = shared ] && echo 1 || echo 0)" ]
+[ "$linked" = "$([ "$kind" = shared ] && echo 1 || echo 0)" ] ||
+    { echo "linked with libkorvex.so.1: $linked times"; exit 1; }

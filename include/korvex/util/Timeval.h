@@ -88,7 +88,7 @@ class CurrentTimeval : public Timeval {
 // millisecond rounds up, and a positive duration is never less than 1. A number too large for 64
 // bits gives 18446744073709551615 and success. False, *res 0 and *charCount 0, when there is
 // nothing to read. p must be NUL-terminated.
-bool convert_string_to_milliseconds(const char* p, unsigned long long* res,
-                                    unsigned long* charCount);
+KORVEX_EXPORT bool convert_string_to_milliseconds(const char* p, unsigned long long* res,
+                                                  unsigned long* charCount);
 
 }  // namespace korvex

@@ -8,6 +8,6 @@ inline namespace KORVEX_EXPORT korvex {
 // The moment from which the layouts' %r and %R count: when logging was initialised, or the first
 // call of this function if that came earlier. The same object every time, never destroyed; safe
 // from any thread. Aborts when the clock fails, as Timeval does.
-const Timeval& epoch_timeval();
+KORVEX_EXPORT const Timeval& epoch_timeval();
 
 }  // namespace korvex

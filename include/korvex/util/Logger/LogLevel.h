@@ -43,7 +43,7 @@ enum LogLevel : int {
 
 // The level's name ("DEBUG" ... "EMERG"), or "???" for any other value; its length in bytes goes
 // to *len, which must not be null. The text lives for ever. Never fails; safe from any thread.
-const char* loglevel2str(unsigned long* len, LogLevel level);
+KORVEX_EXPORT const char* loglevel2str(unsigned long* len, LogLevel level);
 
 }  // namespace korvex
 
