@@ -20,8 +20,7 @@ void toNull(int fd, int flags) {
 
 }  // namespace
 
-Daemon::Daemon(bool wanted) {
-    if (!wanted) return;
+void Daemon::begin() {
     int ends[2];
     if (pipe(ends) != 0) throw systemFailure("cannot make a pipe");
     ScopedFileDescriptor daemonIs(FileDescriptor{ends[0]});

@@ -2,13 +2,13 @@
 
 #include <korvex/util/FileDescriptor.h>
 
-// Puts the process into the background. The process that was started waits there until the daemon
-// is ready, and ends with status 0, or 1 when the daemon ended before that.
+// The process's way into the background. The process that was started waits there until the daemon
+// is ready, and ends with status 0, or 1 when this object went, or the daemon ended, before that.
 class Daemon {
   public:
-    // Goes on in a child without a terminal, if wanted. Only before there are threads. Standard
-    // error stays for complaints about the start. Throws std::runtime_error.
-    explicit Daemon(bool wanted);
+    // Goes on in a child without a terminal. Only before there are threads. Standard error stays
+    // for complaints about the start. Throws std::system_error.
+    void begin();
     // Gives standard error up and lets the waiting process end. Nothing in the foreground.
     void ready();
 

@@ -99,8 +99,9 @@ int main(int argc, char** argv) {
     const struct rlimit noCore {};
     if (info.getDebug()) setrlimit(RLIMIT_CORE, &noCore);  // --noseg
 
+    Daemon daemon;  // outlives the complaint below, for which the starter waits
     try {
-        Daemon daemon(info.getDaemon());  // forks, so it comes before logging and threads
+        if (info.getDaemon()) daemon.begin();  // forks, so it comes before threads
         const Pathname directory = info.getInstallConfigPath();
         const char* const file = info.getUseDebugLog() ? "log-debug.cfg" : "log.cfg";
         if (!Logger::initialize(directory / file, info.getKorvexHome())) return FAILED;

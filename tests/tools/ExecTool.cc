@@ -20,13 +20,18 @@ bool isEmulated() {
 }
 
 void execTool(const std::vector<std::string>& arguments) {
+    execProgram(KORVEX_RECORDS, arguments);
+}
+
+void execProgram(const std::string& path, const std::vector<std::string>& arguments) {
+    const std::string name = path.substr(path.rfind('/') + 1);
     std::vector<const char*> argv;
-    if (isEmulated()) argv.insert(argv.end(), {emulator(), "-0", "korvex-records", KORVEX_RECORDS});
-    if (!isEmulated()) argv.push_back("korvex-records");
+    if (isEmulated()) argv.insert(argv.end(), {emulator(), "-0", name.c_str(), path.c_str()});
+    if (!isEmulated()) argv.push_back(name.c_str());
     for (const std::string& one : arguments)
         argv.push_back(one.c_str());
     argv.push_back(nullptr);
-    execv(isEmulated() ? emulator() : KORVEX_RECORDS, const_cast<char**>(argv.data()));
+    execv(isEmulated() ? emulator() : path.c_str(), const_cast<char**>(argv.data()));
 }
 
 }  // namespace testsupport

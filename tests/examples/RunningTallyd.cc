@@ -1,0 +1,145 @@
+#include "examples/RunningTallyd.h"
+
+#include <arpa/inet.h>
+#include <fcntl.h>
+#include <netinet/in.h>
+#include <sys/prctl.h>
+#include <sys/socket.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <chrono>
+#include <csignal>
+#include <cstdlib>
+#include <filesystem>
+#include <regex>
+#include <thread>
+
+#include "support/LogFiles.h"
+#include "tools/ExecTool.h"
+
+namespace testsupport {
+
+namespace fs = std::filesystem;
+
+namespace {
+
+struct sockaddr_in address(int port) {
+    struct sockaddr_in in {};
+    in.sin_family = AF_INET;
+    in.sin_addr.s_addr = htonl(INADDR_LOOPBACK);
+    in.sin_port = htons(static_cast<std::uint16_t>(port));
+    return in;
+}
+
+int freePort() {
+    const int fd = socket(AF_INET, SOCK_DGRAM, 0);
+    struct sockaddr_in in = address(0);
+    socklen_t length = sizeof in;
+    bind(fd, reinterpret_cast<struct sockaddr*>(&in), length);
+    getsockname(fd, reinterpret_cast<struct sockaddr*>(&in), &length);
+    close(fd);
+    return ntohs(in.sin_port);
+}
+
+}  // namespace
+
+TallydTest::TallydTest() : _port(freePort()) {
+    // The daemon becomes a child of this process, which can tell how it ended.
+    prctl(PR_SET_CHILD_SUBREAPER, 1);
+    fs::copy(KORVEX_SOURCE_DIR "/examples/daemon/home", dir.file("home"),
+             fs::copy_options::recursive);
+    fs::create_directories(dir.file("home/var/log"));
+    fs::create_directories(dir.file("db"));
+}
+
+TallydTest::~TallydTest() {
+    if (pid() != 0) ::kill(pid(), SIGKILL);
+    while (waitpid(-1, nullptr, 0) > 0) {
+    }
+}
+
+void TallydTest::setEnvironment() const {
+    setenv("KORVEX_HOME", dir.file("home").c_str(), 1);
+    setenv("KORVEX_DB", dir.file("db").c_str(), 1);
+}
+
+ChildResult TallydTest::start(std::vector<std::string> arguments) {
+    arguments.insert(arguments.begin(), {"-p", std::to_string(_port)});
+    return runInChild([&] {
+        setEnvironment();
+        execProgram(KORVEX_TALLYD, arguments);
+        return 127;
+    });
+}
+
+void TallydTest::startInForeground() {
+    _foreground = fork();
+    if (_foreground == 0) {
+        setEnvironment();
+        execProgram(KORVEX_TALLYD, {"--nodaemon", "-p", std::to_string(_port)});
+        _exit(127);
+    }
+    eventually([this] { return pid() != 0; });
+    EXPECT_EQ(pid(), _foreground);
+}
+
+pid_t TallydTest::pid() const {
+    const std::string text = readFile(dir.file("db/tallyd.pid"));
+    return text.empty() || text.back() != '\n' ? 0 : std::stoi(text);
+}
+
+void TallydTest::signal(int number) const {
+    ASSERT_NE(pid(), 0);
+    ASSERT_EQ(::kill(pid(), number), 0);
+}
+
+int TallydTest::end(int number) const {
+    const pid_t daemon = pid();
+    signal(number);
+    int status = -1;
+    EXPECT_EQ(waitpid(daemon, &status, 0), daemon);
+    return status;
+}
+
+void TallydTest::send(const std::string& datagram) const {
+    const int fd = socket(AF_INET, SOCK_DGRAM, 0);
+    const struct sockaddr_in in = address(_port);
+    EXPECT_EQ(sendto(fd, datagram.data(), datagram.size(), 0,
+                     reinterpret_cast<const struct sockaddr*>(&in), sizeof in),
+              static_cast<ssize_t>(datagram.size()));
+    close(fd);
+}
+
+void TallydTest::eventually(const std::function<bool()>& condition) {
+    for (int n = 0; n < 3000; ++n) {
+        if (condition()) return;
+        std::this_thread::sleep_for(std::chrono::milliseconds(10));
+    }
+    FAIL() << "never came true";
+}
+
+ChildResult TallydTest::records(const std::vector<std::string>& arguments) const {
+    return runInChild([&] {
+        setEnvironment();
+        execTool(arguments);
+        return 127;
+    });
+}
+
+std::string TallydTest::saved(const std::string& name) const {
+    return records({"get", "count/" + name}).out;
+}
+
+std::vector<std::string> TallydTest::log(const std::string& name) const {
+    const std::regex time("[0-9]{4}-[0-9]{2}-[0-9]{2} [0-9]{2}:[0-9]{2}:[0-9]{2},[0-9]{3} ");
+    std::vector<std::string> lines = linesOf(dir.file("home/var/log/" + name));
+    for (std::string& line : lines) {
+        std::smatch found;
+        EXPECT_TRUE(std::regex_search(line, found, time) && found.position() == 0) << line;
+        line = found.suffix();
+    }
+    return lines;
+}
+
+}  // namespace testsupport

@@ -1,0 +1,54 @@
+#pragma once
+
+#include <gmock/gmock.h>
+#include <sys/types.h>
+
+#include <functional>
+#include <string>
+#include <vector>
+
+#include "support/Child.h"
+#include "support/TempDir.h"
+
+namespace testsupport {
+
+// The example daemon with the home directory that comes with it, run for real on a port of its own.
+class TallydTest : public testing::Test {
+  protected:
+    TallydTest();
+    // Kills what still runs.
+    ~TallydTest() override;
+
+    // Starts it, with the port; the result is that of the process that was started, which is over
+    // when the daemon is ready.
+    ChildResult start(std::vector<std::string> arguments = {});
+    // Starts it with --nodaemon and returns when it has its pid file.
+    void startInForeground();
+    // The id in the pid file; 0 when there is none.
+    pid_t pid() const;
+    // Sends the running daemon a signal; and waits for its end and returns wait(2)'s status.
+    void signal(int number) const;
+    int end(int number) const;
+
+    // Sends a datagram; it has arrived at the socket when this returns.
+    void send(const std::string& datagram) const;
+    // Returns once the condition holds; fails after a while.
+    static void eventually(const std::function<bool()>& condition);
+
+    ChildResult records(const std::vector<std::string>& arguments) const;
+    // What the record file holds for a name, as korvex-records prints it.
+    std::string saved(const std::string& name) const;
+    // The lines of a log file without their times; empty when there is no such file. A line without
+    // a time is a failure.
+    std::vector<std::string> log(const std::string& name) const;
+
+    const TempDir dir;
+
+  private:
+    void setEnvironment() const;
+
+    const int _port;
+    pid_t _foreground = 0;
+};
+
+}  // namespace testsupport
