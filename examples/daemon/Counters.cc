@@ -26,16 +26,17 @@ RecordFileManager& store() {
     return *RecordFileManager::instance();
 }
 
-// Calls use(key, value) with each record whose key begins with the prefix.
-template <class Use>
-void forEachRecord(const std::string& prefix, Use use) {
-    std::vector<PersistentFullData> records;
-    store().enumerate(prefix, records);
-    for (const PersistentFullData& record : records) {
+// Copies of the records whose keys begin with the prefix.
+std::map<std::string, std::string> recordsOf(const std::string& prefix) {
+    std::vector<PersistentFullData> list;
+    store().enumerate(prefix, list);
+    std::map<std::string, std::string> records;
+    for (const PersistentFullData& record : list) {
         const std::unique_ptr<char[]> key(static_cast<char*>(record._pKey));
         const std::unique_ptr<char[]> value(static_cast<char*>(record._pData));
-        use(std::string(key.get(), record._keySize), std::string(value.get(), record._dataSize));
+        records[key.get()].assign(value.get(), record._dataSize);
     }
+    return records;
 }
 
 void put(const std::string& key, std::string value) {
@@ -49,9 +50,8 @@ void put(const std::string& key, std::string value) {
 long long wholeSize() {
     constexpr long long kLengths = 8;  // in front of key and value, 4 bytes each
     long long size = 31;               // the version record
-    forEachRecord("", [&size](const std::string& key, const std::string& value) {
+    for (const auto& [key, value] : recordsOf(""))
         size += kLengths + static_cast<long long>(key.size() + value.size());
-    });
     return size;
 }
 
@@ -65,10 +65,8 @@ void Counters::load(bool fresh) {
     _directory.mkdir(Pathname::MKDIR_PRIVATE);
     if (fresh) _file.renameTo(_directory / "data.old");
     store().init(xml::node());
-    auto& counts = _counts;
-    forEachRecord(kPrefix, [&counts](const std::string& key, const std::string& value) {
-        counts[key.substr(kPrefix.size())] = std::strtoull(value.c_str(), nullptr, 10);
-    });
+    for (const auto& [key, value] : recordsOf(kPrefix))
+        _counts[key.substr(kPrefix.size())] = std::strtoull(value.c_str(), nullptr, 10);
     logger.info("loaded %zu counts", _counts.size());
 }
 

@@ -24,7 +24,7 @@ class Counters {
     void save();
 
   private:
-    bool replaceFile();
+    bool replaceFile() KORVEX_REQUIRES(_mutex);
 
     const Pathname _directory;
     const Pathname _file;

@@ -1,7 +1,8 @@
 #include <gmock/gmock.h>
-#include <sys/wait.h>
+#include <unistd.h>
 
 #include <csignal>
+#include <cstdlib>
 #include <filesystem>
 #include <string>
 #include <vector>
@@ -13,10 +14,11 @@ namespace {
 using testing::Contains;
 using testing::ElementsAre;
 using testing::HasSubstr;
-using testing::Not;
 using testing::StartsWith;
 using testsupport::ChildResult;
+using testsupport::readFile;
 using testsupport::TallydTest;
+using testsupport::writeFile;
 
 constexpr int kEndedWell = 0;  // wait(2)'s status of an exit with 0
 
@@ -63,7 +65,7 @@ TEST_F(TallydTest, TheStarterReturnsWhenThePortIsOpen) {
     ASSERT_EQ(start().status, 0);
     EXPECT_THAT(log("receiver.log"), ElementsAre(StartsWith("INFO  opened port ")));
     EXPECT_THAT(log("tallyd.log"), Contains("[Main Thread] INFO  tallyd: korvexd started"));
-    EXPECT_EQ(getsid(pid()) == getsid(0), false);
+    EXPECT_NE(getsid(pid()), getsid(0));
     EXPECT_EQ(std::filesystem::read_symlink("/proc/" + std::to_string(pid()) + "/cwd"), "/");
     EXPECT_EQ(std::filesystem::read_symlink("/proc/" + std::to_string(pid()) + "/fd/2"),
               "/dev/null");
@@ -139,6 +141,33 @@ TEST_F(TallydTest, ASaveThatFailsLeavesTheFileAndIsTriedAgain) {
     std::filesystem::remove_all(dir.file("db/hashDb/data.new"));
     EXPECT_EQ(end(SIGTERM), kEndedWell);
     EXPECT_EQ(saved("apple"), "2");
+}
+
+// A text of the file that comes with the daemon, with one piece replaced.
+std::string replaced(const std::string& text, const std::string& from, const std::string& to) {
+    const std::size_t place = text.find(from);
+    EXPECT_NE(place, std::string::npos) << from;
+    return place == std::string::npos ? text : std::string(text).replace(place, from.size(), to);
+}
+
+TEST_F(TallydTest, LogrotateTakesItsLogAndLosesNoLine) {
+    const std::string path = "PATH=$PATH:/usr/sbin ";
+    if (std::system((path + "command -v logrotate > /dev/null").c_str()) != 0) {
+        GTEST_SKIP() << "logrotate is not installed";
+    }
+    std::string conf = readFile(KORVEX_SOURCE_DIR "/examples/daemon/system/tallyd.logrotate");
+    conf = replaced(conf, "/opt/tallyd", dir.file("home"));
+    writeFile(dir.file("conf"), replaced(conf, "    su tallyd tallyd\n", ""));
+    ASSERT_EQ(start().status, 0);
+    ASSERT_EQ(std::system(
+                  (path + "logrotate -f -s " + dir.file("state") + " " + dir.file("conf")).c_str()),
+              0);
+    EXPECT_TRUE(std::filesystem::exists(dir.file("home/var/log/tallyd.log.1")));
+    EXPECT_EQ(end(SIGTERM), kEndedWell);
+    EXPECT_THAT(log("tallyd.log"), ElementsAre("[Main Thread] INFO  counters: loaded 0 counts",
+                                               "[Main Thread] INFO  tallyd: korvexd started",
+                                               "[Main Thread] INFO  tallyd: ending by signal 15",
+                                               "[Main Thread] INFO  tallyd: ended"));
 }
 
 }  // namespace

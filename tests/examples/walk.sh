@@ -21,24 +21,25 @@ port=$((20000 + $$ % 12000))
 # walk EXAMPLE: the commands are those after "$ ", the lines below are what they print.
 walk() {
     cd "$root/examples/$1"
+    # shellcheck disable=SC2016  # the README's own backquotes
     sed -n '/^```console$/,/^```$/p' README.md | sed "/^\`\`\`/d; s/8090/$port/g" > "$root/said"
     [ -s "$root/said" ]
     while IFS= read -r line; do
         case $line in
             '$ '*)
-                echo "$line" >> "$root/done"
+                echo "$line" >> "$root/printed"
                 # stdout only; a build's output is not shown.
                 eval "${line#??}" > "$root/out" < /dev/null
-                case $line in *cmake*) ;; *) cat "$root/out" >> "$root/done" ;; esac
+                case $line in *cmake*) ;; *) cat "$root/out" >> "$root/printed" ;; esac
                 ;;
         esac
     done < "$root/said"
     # The times and the home directory are the READMEs' own.
-    for file in said done; do
+    for file in said printed; do
         sed -E -i "s/[0-9]{4}-[0-9]{2}-[0-9]{2} [0-9:]{8},[0-9]{3}/TIME/; s|$HOME|/home/you|" "$root/$file"
     done
-    diff "$root/said" "$root/done"
-    rm "$root/done"
+    diff "$root/said" "$root/printed"
+    rm "$root/printed"
 }
 walk hello
 walk daemon
