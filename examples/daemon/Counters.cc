@@ -80,17 +80,18 @@ bool Counters::add(const std::string& name) {
 
 // The store never frees a value that is replaced, so it is given the counts once a save, not each
 // time that one changes.
-void Counters::save() {
+bool Counters::save() {
     const ScopedMutex lock(_mutex);
-    if (_changed.empty()) return;
+    if (_changed.empty()) return true;
     for (const std::string& name : _changed)
         put(kPrefix + name, std::to_string(_counts[name]));
     if (!replaceFile()) {
         logger.error("cannot save " + _file + "; it is as it was");
-        return;
+        return false;
     }
     logger.info("saved %zu changed counts", _changed.size());
     _changed.clear();
+    return true;
 }
 
 // The store rewrites its file in place and does not say whether that went well. So it writes a new

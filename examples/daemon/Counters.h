@@ -19,9 +19,9 @@ class Counters {
     void load(bool fresh);
     // Counts the name. False when it is none, or a new one beyond the limit.
     bool add(const std::string& name);
-    // Saves what has changed. A failure is logged, leaves the file as it was, and the next save
-    // tries again.
-    void save();
+    // Saves what has changed. A failure is logged and leaves the file as it was; the next save
+    // tries again. Whether all is saved.
+    bool save();
 
   private:
     bool replaceFile() KORVEX_REQUIRES(_mutex);

@@ -8,6 +8,7 @@
 #include <csignal>
 #include <cstdio>
 #include <exception>
+#include <stdexcept>
 #include <string>
 
 #include "Counters.h"
@@ -75,7 +76,7 @@ void run(const LoaderInfo& info, Daemon& daemon) {
     stop.now();
     receiver.join();
     saver.join();
-    counters.save();
+    if (!counters.save()) throw std::runtime_error("ended without the last counts");
     logger.info("ended");
 }
 

@@ -54,7 +54,9 @@ TallydTest::TallydTest() : _port(freePort()) {
 }
 
 TallydTest::~TallydTest() {
-    if (pid() != 0) ::kill(pid(), SIGKILL);
+    for (const pid_t one : _started) {
+        if (waitpid(one, nullptr, WNOHANG) == 0) ::kill(one, SIGKILL);
+    }
     while (waitpid(-1, nullptr, 0) > 0) {
     }
 }
@@ -64,24 +66,29 @@ void TallydTest::setEnvironment() const {
     setenv("KORVEX_DB", dir.file("db").c_str(), 1);
 }
 
-ChildResult TallydTest::start(std::vector<std::string> arguments) {
+ChildResult TallydTest::start(std::vector<std::string> arguments,
+                              const std::function<void()>& prepare) {
     arguments.insert(arguments.begin(), {"-p", std::to_string(_port)});
-    return runInChild([&] {
+    ChildResult result = runInChild([&] {
         setEnvironment();
+        prepare();
         execProgram(KORVEX_TALLYD, arguments);
         return 127;
     });
+    if (pid() != 0) _started.push_back(pid());
+    return result;
 }
 
 void TallydTest::startInForeground() {
-    _foreground = fork();
-    if (_foreground == 0) {
+    const pid_t child = fork();
+    if (child == 0) {
         setEnvironment();
         execProgram(KORVEX_TALLYD, {"--nodaemon", "-p", std::to_string(_port)});
         _exit(127);
     }
+    _started.push_back(child);
     eventually([this] { return pid() != 0; });
-    EXPECT_EQ(pid(), _foreground);
+    EXPECT_EQ(pid(), child);
 }
 
 pid_t TallydTest::pid() const {
@@ -98,7 +105,7 @@ int TallydTest::end(int number) const {
     const pid_t daemon = pid();
     signal(number);
     int status = -1;
-    EXPECT_EQ(waitpid(daemon, &status, 0), daemon);
+    eventually([&] { return waitpid(daemon, &status, WNOHANG) != 0; });
     return status;
 }
 

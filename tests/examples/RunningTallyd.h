@@ -20,8 +20,9 @@ class TallydTest : public testing::Test {
     ~TallydTest() override;
 
     // Starts it, with the port; the result is that of the process that was started, which is over
-    // when the daemon is ready.
-    ChildResult start(std::vector<std::string> arguments = {});
+    // when the daemon is ready. `prepare` runs in that process before it becomes the program.
+    ChildResult start(
+        std::vector<std::string> arguments = {}, const std::function<void()>& prepare = [] {});
     // Starts it with --nodaemon and returns when it has its pid file.
     void startInForeground();
     // The id in the pid file; 0 when there is none.
@@ -48,7 +49,7 @@ class TallydTest : public testing::Test {
     void setEnvironment() const;
 
     const int _port;
-    pid_t _foreground = 0;
+    std::vector<pid_t> _started;
 };
 
 }  // namespace testsupport

@@ -1,4 +1,6 @@
 #include <gmock/gmock.h>
+#include <sys/resource.h>
+#include <sys/wait.h>
 #include <unistd.h>
 
 #include <csignal>
@@ -39,6 +41,16 @@ TEST_F(TallydTest, ATerminatedDaemonHasCountedSavedAndLoggedEverything) {
     EXPECT_THAT(log("receiver.log"), ElementsAre(StartsWith("INFO  opened port "),
                                                  "WARN  refused 7 bytes", "WARN  refused 0 bytes"));
     EXPECT_EQ(pid(), 0);
+}
+
+TEST_F(TallydTest, WhatArrivedBeforeTheSignalIsCounted) {
+    ASSERT_EQ(start().status, 0);
+    signal(SIGSTOP);
+    for (int n = 0; n < 100; ++n)
+        send("apple");
+    signal(SIGTERM);
+    EXPECT_EQ(end(SIGCONT), kEndedWell);
+    EXPECT_EQ(saved("apple"), "100");
 }
 
 TEST_F(TallydTest, TheNextRunGoesOnCounting) {
@@ -141,6 +153,25 @@ TEST_F(TallydTest, ASaveThatFailsLeavesTheFileAndIsTriedAgain) {
     std::filesystem::remove_all(dir.file("db/hashDb/data.new"));
     EXPECT_EQ(end(SIGTERM), kEndedWell);
     EXPECT_EQ(saved("apple"), "2");
+}
+
+TEST_F(TallydTest, ASaveThatIsCutShortIsNotTaken) {
+    const auto limitFiles = [] {
+        const struct rlimit limit { 4096, 4096 };
+        setrlimit(RLIMIT_FSIZE, &limit);
+        std::signal(SIGXFSZ, SIG_IGN);
+    };
+    ASSERT_EQ(start({}, limitFiles).status, 0);
+    send("apple");
+    eventually([this] { return signal(SIGHUP), saved("apple") == "1"; });
+    for (int n = 100; n < 200; ++n)
+        send("apple-and-a-name-that-takes-much-room-in-the-file-" + std::to_string(n));
+    const int status = end(SIGTERM);
+    EXPECT_TRUE(WIFEXITED(status) && WEXITSTATUS(status) == 1);
+    EXPECT_THAT(log("tallyd.log").back(),
+                "[Main Thread] FATAL tallyd: ended without the last counts");
+    EXPECT_EQ(records({"check"}).status, 0);
+    EXPECT_EQ(records({"list"}).out, "count/apple\n");
 }
 
 // A text of the file that comes with the daemon, with one piece replaced.
