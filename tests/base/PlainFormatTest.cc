@@ -98,7 +98,7 @@ TEST(PlainFormatTest, RandomFormatsAsPrintf) {
             fmt += pieces[random() % std::size(pieces)];
         unsigned long a[6];
         for (unsigned long& value : a)
-            value = random() >> random() % 64;
+            value = static_cast<unsigned long>(random() >> random() % 64);
         if (sizeof(long) == sizeof(int)) continue;
         const Outcome outcome = plain(fmt.c_str(), a[0], a[1], a[2], a[3], a[4], a[5]);
         ASSERT_TRUE(outcome.plain) << fmt;

@@ -27,6 +27,21 @@ TEST(PrintfBufferTest, AConversionThatCannotSucceedIsRefusedNotRetriedForEver) {
     EXPECT_EQ(formatted("%ls", unconvertible), "refused");
 }
 
+// What of the format came before the conversion is not left standing.
+TEST(PrintfBufferTest, ARefusedTextIsEmpty) {
+    const auto expectEmpty = [](const char* fmt, ...) {
+        va_list ap;
+        va_start(ap, fmt);
+        const PrintfBuffer buffer(fmt, ap);
+        va_end(ap);
+        EXPECT_FALSE(buffer.ok());
+        EXPECT_EQ(buffer.size(), 0U);
+        EXPECT_STREQ(buffer.data(), "");
+    };
+    const wchar_t unconvertible[] = {static_cast<wchar_t>(0x7fffffff), 0};
+    expectEmpty("before %ls", unconvertible);
+}
+
 TEST(PrintfBufferTest, NulCharactersAreKept) {
     EXPECT_EQ(formatted("a%cb", 0), std::string("a\0b", 3));
 }

@@ -20,8 +20,9 @@ using testsupport::killAfter;
 using testsupport::killAtCall;
 using testsupport::testScale;
 
+// Large enough for several calls of write(2) in each save.
 std::string valueOf(unsigned n) {
-    return std::string(700, static_cast<char>('a' + n % 26));
+    return std::string(20000, static_cast<char>('a' + n % 26));
 }
 
 // The bytes of the n-th save below: n + 1 records.

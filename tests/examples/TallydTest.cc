@@ -10,6 +10,7 @@
 #include <vector>
 
 #include "examples/RunningTallyd.h"
+#include "tools/ExecTool.h"
 
 namespace {
 
@@ -172,6 +173,16 @@ TEST_F(TallydTest, ASaveThatIsCutShortIsNotTaken) {
                 "[Main Thread] FATAL tallyd: ended without the last counts");
     EXPECT_EQ(records({"check"}).status, 0);
     EXPECT_EQ(records({"list"}).out, "count/apple\n");
+}
+
+TEST_F(TallydTest, ItsLoggingConfigurationsHoldNothingUnmeant) {
+    for (const char* name : {"log-cmdline.cfg", "myinstall/log.cfg", "myinstall/log-debug.cfg"}) {
+        const ChildResult result = testsupport::runInChild([&] {
+            testsupport::execLogcheck({dir.file("home/etc/") + name, "--home", dir.file("home")});
+            return 127;
+        });
+        EXPECT_EQ(result.status, 0) << result.out << result.err;
+    }
 }
 
 // A text of the file that comes with the daemon, with one piece replaced.

@@ -129,7 +129,7 @@ TEST_F(LoggingSweep, AFileThatCannotBeLookedAtOrRemovedIsNoLostLine) {
             fault.arm();
             for (unsigned n = 0; n < kMessages; ++n) {
                 LogMsgMetadata facts(&logger, INFO);
-                facts.stamp.set(1000 + 10 * n, 0);
+                facts.stamp.set(static_cast<int>(1000 + 10 * n), 0);
                 appender.write(facts, message(n));
             }
             fault.disarm();

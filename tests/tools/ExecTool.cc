@@ -19,10 +19,6 @@ bool isEmulated() {
     return emulator() != nullptr;
 }
 
-void execTool(const std::vector<std::string>& arguments) {
-    execProgram(KORVEX_RECORDS, arguments);
-}
-
 void execProgram(const std::string& path, const std::vector<std::string>& arguments) {
     const std::string name = path.substr(path.rfind('/') + 1);
     std::vector<const char*> argv;
@@ -32,6 +28,14 @@ void execProgram(const std::string& path, const std::vector<std::string>& argume
         argv.push_back(one.c_str());
     argv.push_back(nullptr);
     execv(isEmulated() ? emulator() : path.c_str(), const_cast<char**>(argv.data()));
+}
+
+void execTool(const std::vector<std::string>& arguments) {
+    execProgram(KORVEX_RECORDS, arguments);
+}
+
+void execLogcheck(const std::vector<std::string>& arguments) {
+    execProgram(KORVEX_LOGCHECK, arguments);
 }
 
 }  // namespace testsupport

@@ -135,6 +135,24 @@ TEST(ThreadTest, AThreadWithoutWorkOfItsOwnEndsAtOnce) {
               0);
 }
 
+TEST(ThreadTest, AThreadThatCannotBeRegisteredSaysSoAndRuns) {
+    for (const Call call : {Call::pthread_key_create, Call::pthread_setspecific}) {
+        const ChildResult result = child([call] {
+            const Thread mainThread;
+            bool ran = false;
+            const FailNth fault(call, 1, ENOMEM);
+            Worker worker("w", [&ran] { ran = true; });
+            worker.go();
+            worker.join();
+            return fault.fired() && ran;
+        });
+        EXPECT_EQ(result.status, 0) << result.signal;
+        EXPECT_THAT(result.err,
+                    testing::HasSubstr("Could not construct ThreadSpecificPointer<Thread> in "
+                                       "ActiveThreads::add\n"));
+    }
+}
+
 TEST(ThreadTest, RegisteringAThreadTwiceIsAnAssertion) {
     const ChildResult result = child([] {
         const Thread mainThread;

@@ -16,6 +16,7 @@ inline namespace korvex {
 // errno as the failing call left it. As thread-safe as the calls beneath.
 class FileDescriptor {
   public:
+    // None, or the one of that number.
     FileDescriptor() = default;
     explicit FileDescriptor(int osdep) : _osdep(osdep) {}
 
@@ -91,6 +92,7 @@ class ScopedFileDescriptor : public FileDescriptor {
 // The same, opened with Pathname::openReadOnlySafer().
 class ScopedSaferFileDescriptor : public ScopedFileDescriptor {
   public:
+    // As the base's, but for the way of opening.
     ScopedSaferFileDescriptor() = default;
     explicit ScopedSaferFileDescriptor(const Pathname& path);
     explicit ScopedSaferFileDescriptor(const FileDescriptor& fd) : ScopedFileDescriptor(fd) {}
@@ -121,6 +123,7 @@ class DirectoryDescriptor {
     DirectoryDescriptor& operator=(const DirectoryDescriptor&) = delete;
     ~DirectoryDescriptor();
 
+    // Whether it is open.
     bool valid() const { return _dir != nullptr; }
     // The next entry but "." and "..", in no particular order: readdir(3). False at the end, errno
     // left alone, and on failure, with errno set (EBADF when it is not open); set errno to 0

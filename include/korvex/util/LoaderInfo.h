@@ -69,7 +69,7 @@ class LoaderInfo {
     std::string getStartupMode() const { return _startupMode; }      // free text
     std::string getHost() const { return _host; }                    // override; usually empty
     std::int32_t getPort() const { return _rpcPort; }                // management port
-    pid_t getPid() const { return _pid; }
+    pid_t getPid() const { return _pid; }                   // the process that called init()
     time_t getStartupTime() const { return _startupTime; }  // seconds since the epoch
     bool getDebug() const { return _isDebug; }              // do not dump core on failure
     bool getDaemon() const { return _isDaemon; }            // run as a daemon

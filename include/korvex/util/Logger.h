@@ -49,6 +49,7 @@ class Logger {
     Logger& operator=(const Logger& other);
     ~Logger();
 
+    // Format as printf(3) does, with %m, and only when the level passes. Nothing ends the process.
     void fatal(const char* fmt, ...) noexcept __attribute__((format(printf, 2, 3)));
     void crit(const char* fmt, ...) noexcept __attribute__((format(printf, 2, 3)));
     void error(const char* fmt, ...) noexcept __attribute__((format(printf, 2, 3)));

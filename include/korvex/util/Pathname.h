@@ -40,6 +40,7 @@ class Pathname : public std::string {
         CREATE_READABLE_NONPUBLIC = 2  // 0440: nobody may write it, not even its owner
     };
 
+    // The text as it stands; nothing is tidied.
     Pathname() = default;
     Pathname(const char* s) : std::string(s) {}         // NOLINT: a path is its text
     Pathname(const std::string& s) : std::string(s) {}  // NOLINT

@@ -78,6 +78,7 @@ class Thread : public PthreadObject {
     // submitAndWait()) and a thread made with new can have itself cleared away.
     class JoinHelper : public InThreadActor {
       public:
+        // A null thread is none.
         explicit JoinHelper(Thread* thr) : _thr(thr) {}
         // Nothing when there is no thread.
         void callback() override;

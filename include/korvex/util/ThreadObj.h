@@ -12,6 +12,7 @@ inline namespace korvex {
 // What a failed thread-library call becomes: what() names the thread, the call and the error.
 class PthreadException : public std::runtime_error {
   public:
+    // Copies the text.
     explicit PthreadException(const char* message) : std::runtime_error(message) {}
 };
 
@@ -161,6 +162,7 @@ class ConditionBaseClass : public PthreadObject {
 // A condition that wakes every waiter.
 class ConditionWakeAll : public ConditionBaseClass {
   public:
+    // Wakes all who wait, whether or not the caller holds their mutex. Checked.
     void wake_all() { internal_wake_all(); }
 };
 

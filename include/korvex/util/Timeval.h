@@ -37,6 +37,7 @@ class Timeval {
     // The instant as local calendar fields, by localtime_r(3); aborts the process when that fails.
     void localtime(struct tm& out) const;
 
+    // Which instant comes first, to the microsecond.
     bool operator<(const Timeval& other) const;
     bool operator<=(const Timeval& other) const;
     bool operator>(const Timeval& other) const { return other < *this; }
@@ -66,7 +67,9 @@ class Timeval {
 // A Timeval that starts as the current time.
 class CurrentTimeval : public Timeval {
   public:
+    // Aborts the process when the clock fails, as setToNow() does.
     CurrentTimeval() { setToNow(); }
+    // A copy keeps its source's instant, and an assignment takes it: neither looks at the clock.
     CurrentTimeval(const CurrentTimeval&) = default;
     CurrentTimeval& operator=(const CurrentTimeval&) = default;
     CurrentTimeval& operator=(const Timeval& other) {

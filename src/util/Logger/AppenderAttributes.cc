@@ -11,6 +11,7 @@
 #include <cstdlib>
 #include <limits>
 #include <string_view>
+#include <vector>
 
 inline namespace korvex {
 
@@ -61,7 +62,7 @@ std::uint32_t saturated(const char* digits) {
 
 }  // namespace
 
-// This and finalSetup() belong to start-up, before other threads log, and take no lock.
+// This and what follows belong to start-up, before other threads log, and take no lock.
 bool LogAppender::setAttribute(const std::string& aname, const char* val,
                                const Pathname& korvexHome) KORVEX_NO_THREAD_SAFETY_ANALYSIS {
     if (aname == "fileName") {
@@ -93,34 +94,33 @@ bool LogAppender::setAttribute(const std::string& aname, const char* val,
     return false;
 }
 
-void LogAppender::finalSetup(const char* name) KORVEX_NO_THREAD_SAFETY_ANALYSIS {
+std::vector<const char*> LogAppender::settle() KORVEX_NO_THREAD_SAFETY_ANALYSIS {
+    std::vector<const char*> warnings;
     if (_fmt == nullptr) _fmt = &rootAppender().layout();
     if (_filename.empty()) {
         if (!_fd.valid()) {
-            LogFormat::internal(this, WARN, "Appender \"%s\" has no filename, assuming stderr",
-                                name);
+            warnings.push_back("has no filename, assuming stderr");
             _fd = FileDescriptor(STDERR_FILENO);
         }
         if (_maxBackupIndex != 0) {
-            LogFormat::internal(this, WARN,
-                                "Appender \"%s\" has maxBackupIndex set without specifying a "
-                                "filename, ignoring",
-                                name);
+            warnings.push_back("has maxBackupIndex set without specifying a filename, ignoring");
             _maxBackupIndex = 0;
         }
         if (_maxSize > 0) {
-            LogFormat::internal(
-                this, WARN,
-                "Appender \"%s\" has maxSize set without specifying a filename, ignoring", name);
+            warnings.push_back("has maxSize set without specifying a filename, ignoring");
             _maxSize = 0;
         }
     }
     if (_maxBackupIndex != 0 && _maxSize == 0) {
-        LogFormat::internal(
-            this, WARN,
-            "Appender \"%s\" has maxBackupIndex set without specifying maxSize, ignoring", name);
+        warnings.push_back("has maxBackupIndex set without specifying maxSize, ignoring");
         _maxBackupIndex = 0;
     }
+    return warnings;
+}
+
+void LogAppender::finalSetup(const char* name) KORVEX_NO_THREAD_SAFETY_ANALYSIS {
+    for (const char* const warning : settle())
+        LogFormat::internal(this, WARN, "Appender \"%s\" %s", name, warning);
     if (writesToFile()) {
         Report report(this);
         openFile(report);

@@ -58,19 +58,18 @@ bool ConfigLines::next(std::string& content) {
 // Copies the line up to and including its "#", leaving out XML comments. Text around a comment
 // grows together and may so form the start of another one; a single pass sees that too, because
 // it looks at what it has copied and not at the line.
-bool ConfigLines::joinAroundComments(std::string& joined) {
+void ConfigLines::joinAroundComments(std::string& joined) {
     joined.clear();
     for (std::size_t pos = 0; pos < _line.size();) {
         const char c = _line[pos++];
         joined += c;
-        if (c == '#') return true;
+        if (c == '#') return;
         if (c != '-' || !endsWith(joined, kCommentStart)) continue;
         joined.resize(joined.size() - kCommentStart.size());
         xml_comment_startline_ = lineno_;
-        if (!handle_xml_comment(pos)) return false;
+        if (!handle_xml_comment(pos)) return;
         xml_comment_startline_ = kNone;
     }
-    return true;
 }
 
 // Goes on behind the comment's end, on whatever line that is; false when the file ends before it.

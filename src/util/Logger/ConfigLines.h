@@ -26,7 +26,7 @@ class ConfigLines {
 
   private:
     bool nextRaw();
-    bool joinAroundComments(std::string& joined);
+    void joinAroundComments(std::string& joined);
     bool handle_xml_comment(std::size_t& pos);
 
     std::FILE* const _file;

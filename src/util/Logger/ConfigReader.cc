@@ -27,15 +27,6 @@ bool isAt(const std::string& line, std::size_t pos, char c) {
     return pos < line.size() && line[pos] == c;
 }
 
-// Applies "name=value", the text behind "category."; false when it says nothing valid.
-bool setup_log_channel(const std::string& cstr) {
-    const std::size_t equals = cstr.find('=');
-    if (equals == cstr.npos) return false;
-    const std::size_t last = equals == 0 ? cstr.npos : cstr.find_last_not_of(kBlanks, equals - 1);
-    const std::string lname = cstr.substr(0, last == cstr.npos ? 0 : last + 1);
-    return LogChannel::find(lname, true)->setConfig(cstr.c_str() + equals + 1);
-}
-
 }  // namespace
 
 ConfigReader::ConfigReader(std::FILE* file, const Pathname& korvexHome)
@@ -70,6 +61,9 @@ void ConfigReader::readRootCategory(const std::string& line, std::size_t key,
     const std::size_t equals = skipBlanks(line, afterKey);
     if (isAt(line, equals, '=')) {
         root_cnf = {_lines.lineno(), line.substr(equals + 1)};
+        if (_listener) {
+            _listener({ConfigStatement::ROOT, _lines.lineno(), "", "", root_cnf.context, true});
+        }
     } else {
         addParseError(line, key);
     }
@@ -86,15 +80,20 @@ void ConfigReader::readAppender(const std::string& line, std::size_t name) {
         addParseError(line, name);
         return;
     }
-    LogAppender& la = *LogAppender::find(line.substr(name, nameEnd - name), true);
+    const std::string appender = line.substr(name, nameEnd - name);
+    LogAppender& la = *LogAppender::find(appender, true);
+    if (_listener) {
+        _listener({ConfigStatement::APPENDER, _lines.lineno(), appender, "", "", true});
+    }
     if (line[nameEnd] == '.') {
-        readAttribute(line, nameEnd + 1, la);
+        readAttribute(line, nameEnd + 1, appender, la);
     } else if (!isAt(line, skipBlanks(line, nameEnd), '=')) {
         addParseError(line, name);
     }
 }
 
-void ConfigReader::readAttribute(const std::string& line, std::size_t name, LogAppender& la) {
+void ConfigReader::readAttribute(const std::string& line, std::size_t name,
+                                 const std::string& appender, LogAppender& la) {
     const std::size_t nameEnd = findDelimiter(line, name, "= \t");
     if (nameEnd == line.size()) {
         addParseError(line, name);
@@ -107,7 +106,12 @@ void ConfigReader::readAttribute(const std::string& line, std::size_t name, LogA
     }
     const std::string aname = line.substr(name, nameEnd - name);
     const std::string attribute_val = line.substr(skipBlanks(line, equals + 1));
-    if (!la.setAttribute(aname, attribute_val.c_str(), _korvexHome)) addParseError(line, 0);
+    const bool ok = la.setAttribute(aname, attribute_val.c_str(), _korvexHome);
+    if (!ok) addParseError(line, 0);
+    if (_listener) {
+        _listener(
+            {ConfigStatement::ATTRIBUTE, _lines.lineno(), appender, aname, attribute_val, ok});
+    }
 }
 
 void ConfigReader::addParseError(const std::string& line, std::size_t from) {
@@ -118,9 +122,24 @@ void ConfigReader::applyRoot() {
     if (!rootChannel().setConfig(root_cnf.context.c_str())) _parseErrors.push_back(root_cnf);
 }
 
+// Applies "name=value", the text behind "category."; false when it says nothing valid.
+bool ConfigReader::applyCategory(const DeferedLogConf& category) {
+    const std::string& cstr = category.context;
+    const std::size_t equals = cstr.find('=');
+    if (equals == cstr.npos) return false;
+    const std::size_t last = equals == 0 ? cstr.npos : cstr.find_last_not_of(kBlanks, equals - 1);
+    const std::string lname = cstr.substr(0, last == cstr.npos ? 0 : last + 1);
+    const char* const value = cstr.c_str() + equals + 1;
+    const bool ok = LogChannel::find(lname, true)->setConfig(value);
+    if (_listener) {
+        _listener({ConfigStatement::CATEGORY, category.lineno, lname, "", value, ok});
+    }
+    return ok;
+}
+
 void ConfigReader::applyCategories() {
     while (!cat_cnf.empty()) {
-        if (setup_log_channel(cat_cnf.front().context)) {
+        if (applyCategory(cat_cnf.front())) {
             cat_cnf.pop_front();
         } else {
             _parseErrors.splice(_parseErrors.end(), cat_cnf, cat_cnf.begin());

@@ -4,8 +4,10 @@
 
 #include "util/Logger/ConfigLines.h"
 
+#include <functional>
 #include <list>
 #include <string>
+#include <utility>
 
 inline namespace korvex {
 
@@ -20,6 +22,19 @@ struct DeferedLogConf {
 
 using DeferedLogConfList = std::list<DeferedLogConf>;
 
+// What the reader made of one line, for who explains a configuration instead of running by it.
+struct ConfigStatement {
+    enum Kind { ROOT, CATEGORY, APPENDER, ATTRIBUTE };
+    Kind kind;
+    unsigned lineno;
+    std::string name;       // the category's or the appender's
+    std::string attribute;  // ATTRIBUTE
+    std::string value;      // as it is applied
+    bool accepted;          // false: it is a parse error too
+};
+
+using ConfigListener = std::function<void(const ConfigStatement&)>;
+
 // Reads a logging configuration line by line. Appenders take shape at once. Root and categories
 // are applied at the end, because a new channel copies the root's final state and may name
 // appenders that are defined further down.
@@ -27,6 +42,10 @@ class ConfigReader {
   public:
     // Reads from `file`, which it does not own; korvexHome replaces "${KORVEX_HOME}".
     ConfigReader(std::FILE* file, const Pathname& korvexHome);
+
+    // The listener hears of the root's value, of each appender that a line names and of each
+    // attribute as they are read, of categories as they are applied.
+    void setListener(ConfigListener listener) { _listener = std::move(listener); }
 
     void readAll();
     void applyRoot();
@@ -39,11 +58,14 @@ class ConfigReader {
     void readLine(const std::string& line);
     void readRootCategory(const std::string& line, std::size_t key, std::size_t afterKey);
     void readAppender(const std::string& line, std::size_t name);
-    void readAttribute(const std::string& line, std::size_t name, LogAppender& la);
+    void readAttribute(const std::string& line, std::size_t name, const std::string& appender,
+                       LogAppender& la);
+    bool applyCategory(const DeferedLogConf& category);
     void addParseError(const std::string& line, std::size_t from);
 
     ConfigLines _lines;
     const Pathname& _korvexHome;
+    ConfigListener _listener;
     DeferedLogConf root_cnf{0, {}};
     DeferedLogConfList cat_cnf;
     DeferedLogConfList _parseErrors;

@@ -51,9 +51,7 @@ void LogFormat::Compiler::literal(const char* from, const char* to) {
     atom.arg.str = from;
     atom.slen = static_cast<unsigned long>(to - from);
     // A literal is its own width: it is never padded or cut, not even one of 4 GiB and more.
-    atom.minw = 0;
     atom.maxw = kUnlimited;
-    atom.justify = 0;
 }
 
 // One conversion; false when the pattern ends inside it, which ends the compilation without an

@@ -396,9 +396,11 @@ TEST_F(RecordFileManagerTest, AnUnreadableFileIsReported) {
 TEST_F(RecordFileManagerTest, AllocationFailuresThrowAndCloseTheFile) {
     const char* const messages[] = {"Unable to allocate memory for reading hash key.",
                                     "Unable to allocate memory for reading hash value."};
-    writeFile(_file, kVersionRecord + record("a", "1"));
-    for (unsigned long k = 1; k <= 4; ++k) {
-        const char* const message = messages[(k - 1) % 2];
+    // Only a long key takes memory of its own.
+    writeFile(_file, record(std::string(256, 'k'), "1") + record(std::string(255, 'k'), "1") +
+                         record(std::string(1000, 'l'), "1"));
+    for (unsigned long k = 1; k <= 5; ++k) {
+        const char* const message = messages[k == 1 || k == 4 ? 0 : 1];
         EXPECT_EQ(run([&] {
                       const CountCalls closes(Call::fclose);
                       const FailNth fault(Call::calloc, k, ENOMEM);

@@ -10,6 +10,7 @@ class Logger;
 // The exception of framework components that have become unusable; what() is the message.
 class ComponentException : public std::runtime_error {
   public:
+    // Logs nothing.
     explicit ComponentException(const std::string& message);
     // Logs the message at error level as it is built, so once, where it is thrown.
     ComponentException(Logger& logger, const std::string& message);

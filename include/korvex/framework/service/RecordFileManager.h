@@ -110,7 +110,7 @@ class RecordFileManager {
     static void keepLockThroughForks();
 
     void load(const Pathname& file, const std::string& prefix, std::string& version);
-    void insert(const std::string& key, std::uint32_t size, void* block);
+    void insert(std::string key, std::uint32_t size, void* block);
 
     static RecordFileManager* __pInstance;
 

@@ -9,6 +9,7 @@
 
 #include <cstdint>
 #include <string>
+#include <vector>
 
 inline namespace korvex {
 
@@ -57,6 +58,18 @@ class LogAppender {
     // for limits that cannot work, and a test open that creates the file and reports a bad path.
     void finalSetup(const char* name);
 
+    // finalSetup() without the test open and without logging: says what is to be said of the
+    // appender ("has no filename, assuming stderr"), in order. A second call finds nothing left.
+    std::vector<const char*> settle();
+
+    // What it is configured to do. It writes to a file when it has a name for one and is not the
+    // root appender.
+    bool writesToFile() const;
+    const Pathname& fileName() const { return _filename; }  // empty: none
+    std::int64_t maxFileSize() const { return _maxSize; }   // bytes; 0 and below: never rotated
+    std::uint32_t maxBackupIndex() const { return _maxBackupIndex; }
+    const LogFormat& layout() const;  // "%m%n" until one is set
+
     // Lays the message out and writes it with one write(2), after that rotating a file that has
     // grown beyond its limit. Every five seconds of message time the file's identity is checked
     // (device and inode), so that a file moved away is left and a new one made. Failures, a line
@@ -70,8 +83,6 @@ class LogAppender {
 
     friend class LoggingLocks;
 
-    bool writesToFile() const;
-    const LogFormat& layout() const;
     void writeLine(const std::string& line, long long now, Report& report) KORVEX_REQUIRES(_mutex);
     void checkIdentity(long long now) KORVEX_REQUIRES(_mutex);
     bool openFile(Report& report) KORVEX_REQUIRES(_mutex);

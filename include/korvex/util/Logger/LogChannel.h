@@ -47,6 +47,11 @@ class LogChannel {
         return level >= minlevel.load(std::memory_order_relaxed);
     }
 
+    // The minimum.
+    LogLevel level() const { return minlevel.load(std::memory_order_relaxed); }
+    // Where messages go, in order; empty: to the root appender. Changed by setConfig() only.
+    const std::vector<LogAppender*>& appenders() const { return _appenders; }
+
     // Hands the message, whatever its level, to each appender in order. Throws what
     // LogAppender::write throws.
     void write(const LogMsgMetadata& mdata, const std::string& msg);

@@ -40,6 +40,9 @@ class LogFormat {
     // LogFormattedDate::fmt throws, and std::bad_alloc.
     void apply(std::string& out, const LogMsgMetadata& md, const std::string& msg) const;
 
+    // The text it was made from.
+    const std::string& pattern() const { return _fmt; }
+
     // The way of every message: level test, metadata, the logger's channel; standard error when
     // the logger is not usable yet or its channel throws. Never throw, keep errno. The second form
     // formats as Logger::vformat does, %m being the errno at the call, and only when the level has

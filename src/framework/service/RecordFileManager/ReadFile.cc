@@ -1,8 +1,8 @@
 #include <korvex/framework/service/ComponentException.h>
 #include <korvex/framework/service/RecordFileManager.h>
 
-#include "base/Stream.h"
 #include "framework/service/RecordFileManager/RecordFormat.h"
+#include "framework/service/RecordFileManager/RecordStream.h"
 #include "framework/service/RecordFileManager/StoreLogger.h"
 #include "framework/service/RecordFileManager/ValueBlock.h"
 
@@ -10,6 +10,7 @@
 #include <strings.h>
 
 #include <algorithm>
+#include <cstring>
 #include <limits>
 
 inline namespace korvex {
@@ -43,17 +44,19 @@ class RecordFileManager::Loader {
     // The next record; false at the end of the file or of what can be read of it.
     bool next();
     bool endWasFlagged() const { return _endWasFlagged; }
-    const char* key() const { return text(_key); }
+    const char* key() const { return _longKey ? text(_longKey) : _key; }
     std::uint32_t size() const { return _size; }
     Block& value() { return _value; }
 
   private:
     bool readLength(std::uint32_t& length, std::size_t& got);
+    void readKey(std::uint32_t size);
 
     RecordFileManager& _store;
     std::FILE* const _file;
     bool _endWasFlagged = false;
-    Block _key;  // NUL-terminated
+    char _key[256];  // NUL-terminated
+    Block _longKey;  // one that does not fit there
     std::uint32_t _size = 0;
     Block _value;
 };
@@ -64,6 +67,19 @@ bool RecordFileManager::Loader::readLength(std::uint32_t& length, std::size_t& g
     if (got != sizeof bytes) return false;
     length = getLength(bytes);
     return true;
+}
+
+// What cannot be read stays zero.
+void RecordFileManager::Loader::readKey(std::uint32_t size) {
+    char* to = _key;
+    _longKey.reset();
+    if (size < sizeof _key) {
+        std::memset(_key, 0, size + 1);
+    } else {
+        _longKey = allocate(size, 1, "Unable to allocate memory for reading hash key.");
+        to = static_cast<char*>(_longKey.get());
+    }
+    _store.readLooped(to, size, _file);
 }
 
 bool RecordFileManager::Loader::next() {
@@ -78,8 +94,7 @@ bool RecordFileManager::Loader::next() {
         }
         return false;
     }
-    _key = allocate(keySize, 1, "Unable to allocate memory for reading hash key.");
-    _store.readLooped(static_cast<char*>(_key.get()), keySize, _file);
+    readKey(keySize);
     if (!readLength(_size, got)) {
         storeLogger().error("Short read for value length, record file may be corrupt.");
         return false;
@@ -100,16 +115,16 @@ void RecordFileManager::preload(const std::string& prefix, const Pathname& file)
 
 void RecordFileManager::load(const Pathname& file, const std::string& prefix,
                              std::string& version) {
-    const Stream stream(file.fopen("rb"));
+    const RecordStream stream(file.fopen("rb"));
     if (!stream) return;
     Loader loader(*this, stream.get());
     while (loader.next()) {
-        const std::string key(loader.key());
+        std::string key(loader.key());
         if (isVersionKey(key)) {
             version.assign(text(loader.value()), strnlen(text(loader.value()), loader.size()));
         } else if (key.compare(0, prefix.size(), prefix) == 0) {
             const ScopedMutex lock(_mutex);
-            insert(key, loader.size(), loader.value().get());
+            insert(std::move(key), loader.size(), loader.value().get());
             static_cast<void>(loader.value().release());
         }
     }

@@ -87,15 +87,9 @@ void RecordFileManager::put(const std::string& key, const PersistentHashData& da
 }
 
 // A replaced block is not freed: callers are known to hold on to values longer than the store does.
-void RecordFileManager::insert(const std::string& key, std::uint32_t size, void* block) {
+void RecordFileManager::insert(std::string key, std::uint32_t size, void* block) {
     // Files lie in key order, so while loading the place is the end.
-    const bool isLast = records.empty() || records.rbegin()->first < key;
-    const auto place = isLast ? records.end() : records.lower_bound(key);
-    if (place != records.end() && place->first == key) {
-        place->second = {size, block};
-    } else {
-        records.emplace_hint(place, key, std::make_pair(size, block));
-    }
+    records.try_emplace(records.end(), std::move(key))->second = {size, block};
 }
 
 void RecordFileManager::get(const std::string& key, PersistentHashData& dataToReturn) const {

@@ -1,8 +1,8 @@
 #include <korvex/framework/service/ComponentException.h>
 #include <korvex/framework/service/RecordFileManager.h>
 
-#include "base/Stream.h"
 #include "framework/service/RecordFileManager/RecordFormat.h"
+#include "framework/service/RecordFileManager/RecordStream.h"
 #include "framework/service/RecordFileManager/StoreLogger.h"
 
 #include <sys/stat.h>
@@ -24,6 +24,15 @@ bool writeField(std::FILE* file, const void* p, std::uint32_t n) {
     return writeBytes(file, length, sizeof length) && writeBytes(file, p, n);
 }
 
+bool writeFields(std::FILE* file, std::string_view key, std::uint32_t size, const void* data) {
+    if (key.size() > std::numeric_limits<std::uint32_t>::max()) {
+        errno = EFBIG;  // the file's lengths have 32 bits
+        return false;
+    }
+    return writeField(file, key.data(), static_cast<std::uint32_t>(key.size())) &&
+           writeField(file, data, size);
+}
+
 void reportFailedWrite() {
     __extension__ storeLogger().error(
         "Failed to write record, giving up on saving file.  Error is %d: %m.", errno);
@@ -37,12 +46,7 @@ bool RecordFileManager::writeRecord(std::FILE* outFile, std::string key, unsigne
         storeLogger().error("Invalid outFile passed to writeRecord.  Cannot write.");
         return false;
     }
-    if (key.size() > std::numeric_limits<std::uint32_t>::max()) {
-        errno = EFBIG;  // the file's lengths have 32 bits
-        return false;
-    }
-    return writeField(outFile, key.data(), static_cast<std::uint32_t>(key.size())) &&
-           writeField(outFile, data, dataLen);
+    return writeFields(outFile, key, dataLen, data);
 }
 
 void RecordFileManager::saveToFile() {
@@ -51,7 +55,7 @@ void RecordFileManager::saveToFile() {
         throw ComponentException(storeLogger(), "Tried to write to db without setting filename.");
     }
     umask(066);  // the records are nobody else's business; never set back
-    Stream file(dbHomePath.fopen("wb"));
+    RecordStream file(dbHomePath.fopen("wb"));
     if (!file) {
         __extension__ storeLogger().error(
             "Unable to open record file for writing at '%s'.  Cannot save hash data.  Error is "
@@ -59,16 +63,16 @@ void RecordFileManager::saveToFile() {
             dbHomePath.c_str(), errno);
         return;
     }
-    writeRecord(file.get(), std::string(VERSION_KEY), static_cast<unsigned>(VERSION_STR.size()),
+    writeFields(file.get(), VERSION_KEY, static_cast<std::uint32_t>(VERSION_STR.size()),
                 VERSION_STR.data());
     for (const auto& [key, value] : records) {
-        if (writeRecord(file.get(), key, value.first, value.second)) continue;
+        if (writeFields(file.get(), key, value.first, value.second)) continue;
         reportFailedWrite();
         std::clearerr(file.get());
         return;
     }
     // A full disk shows here at the latest.
-    if (std::fclose(file.release()) != 0) reportFailedWrite();
+    if (!file.close()) reportFailedWrite();
 }
 
 }  // namespace korvex

@@ -1,0 +1,2 @@
+empty data
+od -A d -t x1z data

@@ -1,0 +1,279 @@
+#include <fcntl.h>
+#include <gmock/gmock.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include <cstdlib>
+#include <map>
+#include <string>
+#include <utility>
+#include <vector>
+
+#include "tools/LogcheckTool.h"
+
+namespace {
+
+using testing::AllOf;
+using testing::EndsWith;
+using testing::HasSubstr;
+using testing::MatchesRegex;
+using testing::Not;
+using testing::StartsWith;
+using testsupport::ChildResult;
+using testsupport::execLogcheck;
+using testsupport::LogcheckToolTest;
+using testsupport::readFile;
+using testsupport::runInChild;
+using testsupport::writeFile;
+
+using KorvexLogcheckTest = LogcheckToolTest;
+
+const std::string kTwoAppenders =
+    "log4cpp.rootCategory=INFO, MAIN   # for every other channel\n"
+    "log4cpp.category.net=DEBUG\n"
+    "log4cpp.category.audit=NOTICE, AUDIT, MAIN\n"
+    "log4cpp.appender.MAIN.fileName=${KORVEX_HOME}/log/main.log\n"
+    "log4cpp.appender.MAIN.maxFileSize=1000\n"
+    "log4cpp.appender.MAIN.maxBackupIndex=5\n"
+    "log4cpp.appender.MAIN.layout=SimpleLayout\n"
+    "log4cpp.appender.AUDIT.fileName=/var/audit.log\n"
+    "log4cpp.appender.AUDIT.layout.ConversionPattern=[%c] %-5p %m%n\n";
+
+TEST_F(KorvexLogcheckTest, ACleanConfigurationIsShownWhole) {
+    const ChildResult result = check(kTwoAppenders, {"--home", "/opt/x"});
+    EXPECT_EQ(result.out,
+              "root\n"
+              "  level   INFO and above\n"
+              "  to      MAIN\n"
+              "\n"
+              "category net\n"
+              "  level   DEBUG and above\n"
+              "  to      MAIN\n"
+              "\n"
+              "category audit\n"
+              "  level   NOTICE and above\n"
+              "  to      AUDIT, MAIN\n"
+              "\n"
+              "appender MAIN\n"
+              "  file    /opt/x/log/main.log\n"
+              "  limits  beyond 1000 bytes the file is rotated; 5 backups are kept: main.log.1 "
+              "(newest) to main.log.5\n"
+              "  layout  %-8p: %m%n\n"
+              "  sample  INFO    : this is a message\n"
+              "  used by the root, net, audit\n"
+              "\n"
+              "appender AUDIT\n"
+              "  file    /var/audit.log\n"
+              "  limits  none: the file is never rotated\n"
+              "  layout  [%c] %-5p %m%n\n"
+              "  sample  [audit] WARN  this is a message\n"
+              "  used by audit\n"
+              "\n"
+              "no errors, no warnings\n");
+    EXPECT_EQ(result.err, "");
+    EXPECT_EQ(result.status, 0);
+}
+
+TEST_F(KorvexLogcheckTest, AnEmptyFileMeansTheRootOnStandardError) {
+    EXPECT_EQ(check("").out,
+              "root\n"
+              "  level   INFO and above\n"
+              "  to      rootAppender (standard error)\n"
+              "\n"
+              "appender rootAppender\n"
+              "  file    standard error\n"
+              "  limits  none\n"
+              "  layout  %m%n\n"
+              "  sample  this is a message\n"
+              "  used by the root\n"
+              "\n"
+              "no errors, no warnings\n");
+}
+
+TEST_F(KorvexLogcheckTest, ASampleIsDatedAndShowsEachOfItsLines) {
+    const std::string out = check(
+                                "rootCategory=ERROR,A\nappender.A.fileName=/a\n"
+                                "appender.A.layout.ConversionPattern=%d{ISO8601} [%t]%n%p: %m%n\n")
+                                .out;
+    EXPECT_THAT(out,
+                testing::ContainsRegex("  sample  [0-9]{4}-[0-9]{2}-[0-9]{2} [0-9:]{8},[0-9]{3} "
+                                       "\\[Main Thread\\]\n          ERROR: this is a message\n"));
+}
+
+TEST_F(KorvexLogcheckTest, TheHomeComesFromTheOptionElseFromTheEnvironment) {
+    configure("rootCategory=INFO,A\nappender.A.fileName=${KORVEX_HOME}/a.log\n");
+    const auto withHome = [&](const std::vector<std::string>& arguments) {
+        return runInChild([&] {
+                   setenv("KORVEX_HOME", "/env//home/", 1);
+                   execLogcheck(arguments);
+                   return 127;
+               })
+            .out;
+    };
+    EXPECT_THAT(withHome({file}), HasSubstr("file    /env/home/a.log\n"));
+    EXPECT_THAT(withHome({"--home=/opt", file}), HasSubstr("file    /opt/a.log\n"));
+    const ChildResult without = run({file});
+    EXPECT_THAT(without.out, HasSubstr("file    ${KORVEX_HOME}/a.log\n"));
+    EXPECT_EQ(without.status, 0);
+}
+
+TEST_F(KorvexLogcheckTest, OneBackupAndNoneAreSaidInTheirOwnWords) {
+    const std::string start = "rootCategory=INFO,A\nappender.A.fileName=/a\n";
+    EXPECT_THAT(check(start + "appender.A.maxFileSize=7\nappender.A.maxBackupIndex=1\n").out,
+                HasSubstr("beyond 7 bytes the file is rotated; 1 backup is kept: a.1\n"));
+    EXPECT_THAT(check(start + "appender.A.maxFileSize=7\n").out,
+                HasSubstr("beyond 7 bytes the file starts again empty; no backup is kept\n"));
+}
+
+TEST_F(KorvexLogcheckTest, AChannelOfACategoryGetsWhatItsLevelLetsPass) {
+    const ChildResult result = check(kTwoAppenders, {"--channel", "audit", "--home", "/opt/x"});
+    const std::string both = "AUDIT (/var/audit.log), MAIN (/opt/x/log/main.log)\n";
+    EXPECT_EQ(result.out, "channel audit\n  DEBUG   dropped\n  INFO    dropped\n  NOTICE  " + both +
+                              "  WARN    " + both + "  ERROR   " + both + "  CRIT    " + both +
+                              "  ALERT   " + both + "  FATAL   " + both + "  EMERG   " + both +
+                              "\nno errors, no warnings\n");
+    EXPECT_EQ(result.status, 0);
+}
+
+TEST_F(KorvexLogcheckTest, AChannelWithoutACategoryIsTheRoots) {
+    EXPECT_THAT(check("rootCategory=FATAL\n", {"--channel=no.such"}).out,
+                AllOf(StartsWith("channel no.such: no category of its own, so the root's\n"),
+                      HasSubstr("  ALERT   dropped\n"
+                                "  FATAL   rootAppender (standard error)\n"
+                                "  EMERG   rootAppender (standard error)\n")));
+}
+
+TEST_F(KorvexLogcheckTest, AChannelKeepsTheStatusOfTheWholeFile) {
+    EXPECT_EQ(check("nonsense\n", {"--channel", "a"}).status, 2);
+    EXPECT_EQ(check("appender.A.fileName=/a\n", {"--channel", "a"}).status, 1);
+}
+
+// Names, kinds, contents and times of change of all that is below the directory.
+std::map<std::string, std::vector<std::string>> stateOf(const std::string& root) {
+    std::map<std::string, std::vector<std::string>> state;
+    const auto note = [&](const std::string& path) {
+        struct stat st {};
+        EXPECT_EQ(lstat(path.c_str(), &st), 0) << path;
+        state[path] = {std::to_string(st.st_mode), std::to_string(st.st_size),
+                       std::to_string(st.st_mtim.tv_sec) + '.' + std::to_string(st.st_mtim.tv_nsec),
+                       std::to_string(st.st_ctim.tv_sec) + '.' + std::to_string(st.st_ctim.tv_nsec),
+                       S_ISREG(st.st_mode) ? readFile(path) : ""};
+    };
+    note(root);
+    for (const auto& entry : std::filesystem::recursive_directory_iterator(root))
+        note(entry.path().string());
+    return state;
+}
+
+TEST_F(KorvexLogcheckTest, NothingIsCreatedOrChanged) {
+    ASSERT_EQ(mkdir(dir.file("log").c_str(), 0700), 0);
+    writeFile(dir.file("log/main.log"), std::string(2000, 'x'));
+    configure(kTwoAppenders + "log4cpp.appender.NEW.fileName=" + dir.file("log/new.log") + "\n");
+    const auto before = stateOf(dir.path());
+    const ChildResult result = run({file, "--home", dir.path()});
+    EXPECT_THAT(result.out, HasSubstr(dir.file("log/new.log")));
+    EXPECT_EQ(result.status, 1);
+    EXPECT_EQ(stateOf(dir.path()), before);
+}
+
+TEST_F(KorvexLogcheckTest, WhatCannotBeReadIsStatusTwo) {
+    const ChildResult missing = run({dir.file("none")});
+    EXPECT_EQ(missing.err,
+              "korvex-logcheck: cannot read " + dir.file("none") + ": No such file or directory\n");
+    EXPECT_EQ(missing.out, "");
+    EXPECT_EQ(missing.status, 2);
+    const ChildResult directory = run({dir.path()});
+    EXPECT_EQ(directory.err, "korvex-logcheck: cannot read " + dir.path() + ": Is a directory\n");
+    EXPECT_EQ(directory.status, 2);
+}
+
+TEST_F(KorvexLogcheckTest, WrongUsageIsStatusTwo) {
+    for (const std::vector<std::string>& arguments : std::vector<std::vector<std::string>>{
+             {}, {"a", "b"}, {"--nonsense", "a"}, {"a", "--home"}, {"a", "--channel"}}) {
+        const ChildResult result = run(arguments);
+        EXPECT_EQ(result.status, 2);
+        EXPECT_THAT(result.err, StartsWith("korvex-logcheck: "));
+        EXPECT_EQ(result.out, "");
+    }
+}
+
+TEST_F(KorvexLogcheckTest, HelpAndVersionAreStatusZero) {
+    EXPECT_THAT(run({"--version"}).out, MatchesRegex("korvex-logcheck [0-9.]+\n"));
+    const ChildResult help = run({"--help"});
+    EXPECT_THAT(help.out, AllOf(HasSubstr("FILE [--home DIR] [--channel NAME]"),
+                                HasSubstr("--channel=NAME"), HasSubstr("--home=DIR")));
+    EXPECT_EQ(help.status, 0);
+}
+
+TEST_F(KorvexLogcheckTest, ALostOutputIsStatusTwo) {
+    configure("");
+    const ChildResult result = runInChild([&] {
+        dup2(open("/dev/full", O_WRONLY), STDOUT_FILENO);
+        execLogcheck({file});
+        return 127;
+    });
+    EXPECT_EQ(result.err, "korvex-logcheck: standard output: No space left on device\n");
+    EXPECT_EQ(result.status, 2);
+}
+
+// Runs the tool with a terminal as its standard output and gives what that shows.
+std::string onTerminal(const std::string& file,
+                       const std::vector<std::pair<std::string, std::string>>& environment) {
+    const int terminal = posix_openpt(O_RDWR | O_NOCTTY);
+    EXPECT_EQ(grantpt(terminal), 0);
+    EXPECT_EQ(unlockpt(terminal), 0);
+    const std::string name = ptsname(terminal);
+    // Held open, so that what is written stays to be read.
+    const int slave = open(name.c_str(), O_RDWR | O_NOCTTY);
+    runInChild([&] {
+        setenv("TERM", "xterm", 1);
+        unsetenv("NO_COLOR");
+        for (const auto& [key, value] : environment)
+            setenv(key.c_str(), value.c_str(), 1);
+        dup2(slave, STDOUT_FILENO);
+        execLogcheck({file});
+        return 127;
+    });
+    // What is written may come in pieces, and late: the mark comes last.
+    EXPECT_EQ(write(slave, "\004", 1), 1);
+    std::string shown;
+    char buf[4096];
+    for (ssize_t got;
+         shown.find('\004') == shown.npos && (got = read(terminal, buf, sizeof buf)) > 0;)
+        shown.append(buf, static_cast<std::size_t>(got));
+    close(slave);
+    close(terminal);
+    return shown;
+}
+
+TEST_F(KorvexLogcheckTest, ThereAreColoursOnATerminalOnly) {
+    const std::string plain = check("x\n").out;
+    EXPECT_THAT(plain, Not(HasSubstr("\033")));
+    const std::string colourful = onTerminal(file, {});
+    EXPECT_THAT(colourful, StartsWith("\033[1mroot\033[0m"));
+    EXPECT_THAT(colourful, HasSubstr(":1: \033[1;31merror: \033[0mParse error"));
+}
+
+TEST_F(KorvexLogcheckTest, NoColorAndADumbTerminalAreRespected) {
+    configure("x\n");
+    EXPECT_THAT(onTerminal(file, {{"NO_COLOR", "1"}}), StartsWith("root\r\n"));
+    EXPECT_THAT(onTerminal(file, {{"TERM", "dumb"}}), StartsWith("root\r\n"));
+    EXPECT_THAT(onTerminal(file, {{"NO_COLOR", ""}}), StartsWith("\033[1m"));
+}
+
+TEST_F(KorvexLogcheckTest, NoControlCharacterOfTheFileReachesTheTerminal) {
+    const std::string out = check(
+                                "rootCategory=\033[2J\n"
+                                "category.\033x=INFO\n"
+                                "appender.\aA.fileName=/\b\n"
+                                "appender.\aA.layout.ConversionPattern=\033[m%m\n"
+                                "\033]0;\n")
+                                .out;
+    EXPECT_THAT(out, Not(testing::ContainsRegex("[\x01-\x09\x0b-\x1f\x7f]")));
+    EXPECT_THAT(out, AllOf(HasSubstr("category \\x1bx\n"), HasSubstr("appender \\x07A\n"),
+                           HasSubstr("file    /\\x08\n"), HasSubstr("layout  \\x1b[m%m\n"),
+                           HasSubstr("sample  \\x1b[mthis is a message\n"),
+                           HasSubstr(":5: error: Parse error at \"\\x1b]0;\"")));
+}
+
+}  // namespace

@@ -1,0 +1,47 @@
+#pragma once
+
+#include <korvex/util/Logger.h>
+
+#include <string>
+#include <vector>
+
+#include "util/Logger/ConfigReader.h"
+
+// An appender that the file names. Its statements are those of its attributes, in the file's order.
+struct Appender {
+    std::string name;
+    unsigned lineno;  // where it is first named
+    const LogAppender* made;
+    std::vector<ConfigStatement> attributes;
+    std::vector<const char*> complaints;  // what every start of a program would say of it
+};
+
+// A channel that the file speaks of: the root, or a category. Its statements are the lines that
+// apply to it; of the root's, only the last one does.
+struct Channel {
+    std::string name;  // of a category
+    const LogChannel* made;
+    std::vector<ConfigStatement> statements;
+};
+
+// What a configuration comes to, as the library reads it. No log file is opened.
+struct Configuration {
+    // Throws Failure when the file cannot be read. Once per process: appenders and channels are
+    // the process's own.
+    static Configuration read(const Pathname& file, const Pathname& home);
+
+    const Appender* appenderOf(const LogAppender* made) const;
+    // Where the channel's messages go, in order: never empty.
+    static std::vector<const LogAppender*> destinations(const LogChannel& channel);
+    // The names of the channels that write to it.
+    std::vector<std::string> users(const LogAppender& appender) const;
+    // "MAIN", or "rootAppender".
+    std::string nameOf(const LogAppender* made) const;
+
+    Channel root;
+    std::vector<Channel> categories;  // in the order in which they come into being
+    std::vector<Appender> appenders;  // in the file's order
+    Appender rootAppender;            // not among the others
+    DeferedLogConfList parseErrors;
+    unsigned openComment = ConfigLines::kNone;  // the line of a comment that never ends
+};

@@ -1,0 +1,16 @@
+#pragma once
+
+#include <korvex/util/Pathname.h>
+
+#include <optional>
+#include <string>
+
+// The command line, taken apart.
+struct Options {
+    Pathname file;
+    Pathname home;  // empty: "${KORVEX_HOME}" stays as written
+    std::optional<std::string> channel;
+};
+
+// Throws Failure. --help and --version end the process.
+Options parseOptions(int argc, const char* const* argv);
