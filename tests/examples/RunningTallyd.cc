@@ -12,6 +12,7 @@
 #include <csignal>
 #include <cstdlib>
 #include <filesystem>
+#include <fstream>
 #include <regex>
 #include <thread>
 
@@ -24,28 +25,47 @@ namespace fs = std::filesystem;
 
 namespace {
 
-struct sockaddr_in address(int port) {
+// A loopback address for each process, by its id of at most 22 bits: tests that run in parallel
+// never meet.
+std::string ownHost() {
+    struct in_addr own {};
+    own.s_addr = htonl(0x7f400000U + static_cast<std::uint32_t>(getpid()));
+    return inet_ntoa(own);
+}
+
+struct sockaddr_in addressOf(const std::string& host, int port) {
     struct sockaddr_in in {};
     in.sin_family = AF_INET;
-    in.sin_addr.s_addr = htonl(INADDR_LOOPBACK);
+    in.sin_addr.s_addr = inet_addr(host.c_str());
     in.sin_port = htons(static_cast<std::uint16_t>(port));
     return in;
 }
 
-int freePort() {
-    const int fd = socket(AF_INET, SOCK_DGRAM, 0);
-    struct sockaddr_in in = address(0);
-    socklen_t length = sizeof in;
-    bind(fd, reinterpret_cast<struct sockaddr*>(&in), length);
-    getsockname(fd, reinterpret_cast<struct sockaddr*>(&in), &length);
-    close(fd);
-    return ntohs(in.sin_port);
+// The first that nobody holds at all addresses, below those that the kernel hands out by itself.
+int freePort(const std::string& host) {
+    for (int port = 20000; port < 32000; ++port) {
+        const int fd = socket(AF_INET, SOCK_DGRAM, 0);
+        const struct sockaddr_in in = addressOf(host, port);
+        const bool bound = bind(fd, reinterpret_cast<const struct sockaddr*>(&in), sizeof in) == 0;
+        close(fd);
+        if (bound) return port;
+    }
+    ADD_FAILURE() << "no port of " << host << " is free";
+    return 0;
+}
+
+void killChildren() {
+    const std::string self = std::to_string(getpid());
+    std::ifstream children("/proc/" + self + "/task/" + self + "/children");
+    for (pid_t child; children >> child;)
+        kill(child, SIGKILL);
 }
 
 }  // namespace
 
-TallydTest::TallydTest() : _port(freePort()) {
-    // The daemon becomes a child of this process, which can tell how it ended.
+TallydTest::TallydTest() : _host(ownHost()), _port(freePort(_host)) {
+    // The daemon becomes a child of this process, which can tell how it ended and leaves none
+    // behind.
     prctl(PR_SET_CHILD_SUBREAPER, 1);
     fs::copy(KORVEX_SOURCE_DIR "/examples/daemon/home", dir.file("home"),
              fs::copy_options::recursive);
@@ -54,11 +74,9 @@ TallydTest::TallydTest() : _port(freePort()) {
 }
 
 TallydTest::~TallydTest() {
-    for (const pid_t one : _started) {
-        if (waitpid(one, nullptr, WNOHANG) == 0) ::kill(one, SIGKILL);
-    }
-    while (waitpid(-1, nullptr, 0) > 0) {
-    }
+    do {
+        killChildren();  // again and again: what those started becomes ours
+    } while (waitpid(-1, nullptr, 0) > 0);
 }
 
 void TallydTest::setEnvironment() const {
@@ -68,25 +86,22 @@ void TallydTest::setEnvironment() const {
 
 ChildResult TallydTest::start(std::vector<std::string> arguments,
                               const std::function<void()>& prepare) {
-    arguments.insert(arguments.begin(), {"-p", std::to_string(_port)});
-    ChildResult result = runInChild([&] {
+    arguments.insert(arguments.begin(), {"-h", _host, "-p", std::to_string(_port)});
+    return runInChild([&] {
         setEnvironment();
         prepare();
         execProgram(KORVEX_TALLYD, arguments);
         return 127;
     });
-    if (pid() != 0) _started.push_back(pid());
-    return result;
 }
 
 void TallydTest::startInForeground() {
     const pid_t child = fork();
     if (child == 0) {
         setEnvironment();
-        execProgram(KORVEX_TALLYD, {"--nodaemon", "-p", std::to_string(_port)});
+        execProgram(KORVEX_TALLYD, {"--nodaemon", "-h", _host, "-p", std::to_string(_port)});
         _exit(127);
     }
-    _started.push_back(child);
     eventually([this] { return pid() != 0; });
     EXPECT_EQ(pid(), child);
 }
@@ -111,7 +126,7 @@ int TallydTest::end(int number) const {
 
 void TallydTest::send(const std::string& datagram) const {
     const int fd = socket(AF_INET, SOCK_DGRAM, 0);
-    const struct sockaddr_in in = address(_port);
+    const struct sockaddr_in in = addressOf(_host, _port);
     EXPECT_EQ(sendto(fd, datagram.data(), datagram.size(), 0,
                      reinterpret_cast<const struct sockaddr*>(&in), sizeof in),
               static_cast<ssize_t>(datagram.size()));

@@ -12,15 +12,17 @@
 
 namespace testsupport {
 
-// The example daemon with the home directory that comes with it, run for real on a port of its own.
+// The example daemon with the home directory that comes with it, run for real on an address of its
+// own.
 class TallydTest : public testing::Test {
   protected:
     TallydTest();
-    // Kills what still runs.
+    // Kills whatever still runs.
     ~TallydTest() override;
 
-    // Starts it, with the port; the result is that of the process that was started, which is over
-    // when the daemon is ready. `prepare` runs in that process before it becomes the program.
+    // Starts it, with the address and the port; the result is that of the process that was started,
+    // which is over when the daemon is ready. `prepare` runs in that process before it becomes the
+    // program.
     ChildResult start(
         std::vector<std::string> arguments = {}, const std::function<void()>& prepare = [] {});
     // Starts it with --nodaemon and returns when it has its pid file.
@@ -48,8 +50,8 @@ class TallydTest : public testing::Test {
   private:
     void setEnvironment() const;
 
+    const std::string _host;
     const int _port;
-    std::vector<pid_t> _started;
 };
 
 }  // namespace testsupport

@@ -17,6 +17,7 @@ mkdir "$HOME"
 
 # A port that nobody has, instead of the README's.
 port=$((20000 + $$ % 12000))
+while grep -q ":$(printf %04X $port) " /proc/net/udp; do port=$((port + 1)); done
 
 # walk EXAMPLE: the commands are those after "$ ", the lines below are what they print.
 walk() {
