@@ -14,6 +14,7 @@
 #include <filesystem>
 #include <fstream>
 #include <regex>
+#include <stdexcept>
 #include <thread>
 
 #include "support/LogFiles.h"
@@ -112,13 +113,17 @@ pid_t TallydTest::pid() const {
 }
 
 void TallydTest::signal(int number) const {
-    ASSERT_NE(pid(), 0);
-    ASSERT_EQ(::kill(pid(), number), 0);
+    const pid_t daemon = pid();
+    if (daemon == 0 || ::kill(daemon, number) != 0) throw std::runtime_error("no daemon runs");
 }
 
 int TallydTest::end(int number) const {
     const pid_t daemon = pid();
     signal(number);
+    return endOf(daemon);
+}
+
+int TallydTest::endOf(pid_t daemon) {
     int status = -1;
     eventually([&] { return waitpid(daemon, &status, WNOHANG) != 0; });
     return status;
@@ -138,7 +143,7 @@ void TallydTest::eventually(const std::function<bool()>& condition) {
         if (condition()) return;
         std::this_thread::sleep_for(std::chrono::milliseconds(10));
     }
-    FAIL() << "never came true";
+    throw std::runtime_error("what the test waits for never came true");
 }
 
 ChildResult TallydTest::records(const std::vector<std::string>& arguments) const {

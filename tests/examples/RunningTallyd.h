@@ -29,13 +29,15 @@ class TallydTest : public testing::Test {
     void startInForeground();
     // The id in the pid file; 0 when there is none.
     pid_t pid() const;
-    // Sends the running daemon a signal; and waits for its end and returns wait(2)'s status.
+    // Sends the running daemon a signal, and throws when none runs; and waits for its end and
+    // returns wait(2)'s status.
     void signal(int number) const;
     int end(int number) const;
+    static int endOf(pid_t daemon);  // only waits
 
     // Sends a datagram; it has arrived at the socket when this returns.
     void send(const std::string& datagram) const;
-    // Returns once the condition holds; fails after a while.
+    // Returns once the condition holds; throws after a while, which ends the test.
     static void eventually(const std::function<bool()>& condition);
 
     ChildResult records(const std::vector<std::string>& arguments) const;

@@ -1,5 +1,7 @@
+#include <fcntl.h>
 #include <gmock/gmock.h>
 #include <sys/resource.h>
+#include <sys/stat.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
@@ -45,12 +47,26 @@ TEST_F(TallydTest, ATerminatedDaemonHasCountedSavedAndLoggedEverything) {
 }
 
 TEST_F(TallydTest, WhatArrivedBeforeTheSignalIsCounted) {
+    // A log that is a full pipe holds the receiver up at its first line, until the end has begun.
+    const std::string path = dir.file("home/var/log/receiver.log");
+    ASSERT_EQ(mkfifo(path.c_str(), 0600), 0);
+    const int pipe = open(path.c_str(), O_RDWR | O_NONBLOCK);
     ASSERT_EQ(start().status, 0);
-    signal(SIGSTOP);
+    while (write(pipe, "x", 1) == 1) {
+    }
+    send("no name");
     for (int n = 0; n < 100; ++n)
         send("apple");
+    const pid_t daemon = pid();
     signal(SIGTERM);
-    EXPECT_EQ(end(SIGCONT), kEndedWell);
+    eventually([this] {
+        return log("tallyd.log").back() == "[Main Thread] INFO  tallyd: ending by signal 15";
+    });
+    char bytes[4096];
+    while (read(pipe, bytes, sizeof bytes) > 0) {
+    }
+    EXPECT_EQ(endOf(daemon), kEndedWell);
+    close(pipe);
     EXPECT_EQ(saved("apple"), "100");
 }
 
