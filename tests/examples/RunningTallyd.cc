@@ -8,12 +8,12 @@
 #include <sys/wait.h>
 #include <unistd.h>
 
+#include <algorithm>
 #include <chrono>
 #include <csignal>
 #include <cstdlib>
 #include <filesystem>
 #include <fstream>
-#include <regex>
 #include <stdexcept>
 #include <thread>
 
@@ -53,6 +53,10 @@ int freePort(const std::string& host) {
     }
     ADD_FAILURE() << "no port of " << host << " is free";
     return 0;
+}
+
+bool isDigit(char c) {
+    return c >= '0' && c <= '9';
 }
 
 void killChildren() {
@@ -159,12 +163,13 @@ std::string TallydTest::saved(const std::string& name) const {
 }
 
 std::vector<std::string> TallydTest::log(const std::string& name) const {
-    const std::regex time("[0-9]{4}-[0-9]{2}-[0-9]{2} [0-9]{2}:[0-9]{2}:[0-9]{2},[0-9]{3} ");
+    const std::string time = "0000-00-00 00:00:00,000 ";
     std::vector<std::string> lines = linesOf(dir.file("home/var/log/" + name));
     for (std::string& line : lines) {
-        std::smatch found;
-        EXPECT_TRUE(std::regex_search(line, found, time) && found.position() == 0) << line;
-        line = found.suffix();
+        std::string shape = line.substr(0, time.size());
+        std::replace_if(shape.begin(), shape.end(), isDigit, '0');
+        EXPECT_EQ(shape, time) << line;
+        line.erase(0, time.size());
     }
     return lines;
 }
