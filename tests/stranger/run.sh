@@ -1,6 +1,7 @@
 #!/bin/sh
 # Installs the library into a temporary prefix, then builds and runs a small stranger against it.
-# Usage: run.sh SOURCE-DIR static|shared|system find_package|pkg-config BUILD-DIR CXX
+# Usage: run.sh SOURCE-DIR static|shared|system find_package|pkg-config|examples BUILD-DIR CXX [RECORDS]
+# "examples" builds the examples instead, and runs them with the record tool RECORDS.
 # BUILD-DIR holds the library's build, which the ways of one kind share. The kind "system" is static,
 # on a system that has xmlwrapp (a stand-in for it, fake-xmlwrapp).
 set -eu
@@ -29,7 +30,11 @@ pc_dir=$(dirname "$(find "$prefix/moved" -name korvex.pc)")
 PKG_CONFIG_PATH="$pc_dir:${PKG_CONFIG_PATH:-}"
 export PKG_CONFIG_PATH
 
-if [ "$way" = find_package ]; then
+if [ "$way" = examples ]; then
+    CXX="$cxx" CMAKE_PREFIX_PATH="$prefix/moved" PATH="$(dirname "$6"):$PATH" \
+        "$source/tests/examples/walk.sh" "$source/examples"
+    exit
+elif [ "$way" = find_package ]; then
     cmake -S "$source/tests/stranger/project" -B "$prefix/build" -G Ninja \
         -DCMAKE_CXX_COMPILER="$cxx" -DCMAKE_PREFIX_PATH="$prefix/moved" > /dev/null
     cmake --build "$prefix/build"
