@@ -31,7 +31,8 @@ struct Received {
 std::vector<poptOption> optionTable(Received& to) {
     return {
         {"file", 'f', POPT_ARG_STRING, nullptr, FILE_NAME, "use this record file", "FILE"},
-        {"long", 'l', POPT_ARG_NONE, &to.longList, 0, "list: with the values' sizes", nullptr},
+        {"long", 'l', POPT_ARG_NONE, &to.longList, 0, "list, diff: with the values' sizes",
+         nullptr},
         {"null", '0', POPT_ARG_NONE, &to.nulSeparated, 0, "list: raw keys, each ended by a NUL",
          nullptr},
         {"hex", 'x', POPT_ARG_NONE, &to.hex, 0, "get: the value as hex digits", nullptr},
@@ -73,8 +74,8 @@ Options parseOptions(int argc, const char* const* argv) {
     arguments.push_back(nullptr);
     const Context context(poptGetContext("korvex-records", static_cast<int>(arguments.size()) - 1,
                                          arguments.data(), table.data(), 0));
-    poptSetOtherOptionHelp(context.get(),
-                           "[OPTION...] list|get|put|remove|dump|load|check [ARGUMENT...]");
+    poptSetOtherOptionHelp(
+        context.get(), "[OPTION...] list|get|put|remove|dump|load|check|diff|stats [ARGUMENT...]");
     Options options;
     int rc = 0;
     while ((rc = poptGetNextOpt(context.get())) > 0)

@@ -4,7 +4,9 @@
 
 #include <cstdio>
 
+#include "Progress.h"
 #include "Status.h"
+#include "Terminal.h"
 
 namespace {
 
@@ -15,6 +17,8 @@ namespace {
 }  // namespace
 
 void write(std::string_view bytes) {
+    static const bool isShown = isTerminal(STDOUT_FILENO);
+    if (isShown) progressAside();
     if (std::fwrite(bytes.data(), 1, bytes.size(), stdout) != bytes.size()) lost();
 }
 
