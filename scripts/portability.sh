@@ -76,7 +76,7 @@ build() {
         set -- -G Ninja -DCMAKE_CXX_COMPILER="$cc" -DCMAKE_CXX_FLAGS="$flags" \
             -DCMAKE_C_COMPILER="$(echo "$cc" | sed "s/clang++/clang/;s/g++/gcc/")" \
             -DCMAKE_C_FLAGS="$(echo "$flags" | sed "s/-stdlib=[^ ]*//")" \
-            -DCMAKE_PREFIX_PATH="$gtest" -DCMAKE_BUILD_TYPE=RelWithDebInfo
+            -DCMAKE_PREFIX_PATH="$gtest" -DCMAKE_BUILD_TYPE=Release -DCMAKE_CXX_FLAGS_RELEASE="-O1 -DNDEBUG"
         if [ -n "$emulator" ]; then
             set -- "$@" -DCMAKE_SYSTEM_NAME=Linux -DCMAKE_CROSSCOMPILING_EMULATOR="$emulator"
         fi

@@ -95,9 +95,11 @@ bool read(const std::string& pattern, std::size_t& at, Conversion& conversion) {
 }
 
 std::string fitted(const std::string& text, const Conversion& conversion) {
-    if (conversion.maxw && *conversion.maxw < text.size()) return text.substr(0, *conversion.maxw);
+    if (conversion.maxw && *conversion.maxw < text.size()) {
+        return text.substr(0, static_cast<std::size_t>(*conversion.maxw));
+    }
     if (text.size() >= conversion.minw) return text;
-    const std::size_t missing = conversion.minw - text.size();
+    const auto missing = static_cast<std::size_t>(conversion.minw) - text.size();
     if (conversion.flag == '-') return text + std::string(missing, ' ');
     return std::string(missing, conversion.flag) + text;
 }

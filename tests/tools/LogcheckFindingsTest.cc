@@ -214,6 +214,12 @@ TEST_F(LogcheckFindingsTest, TheRootAppenderStaysWhereItIs) {
                             "on standard error"));
 }
 
+TEST_F(LogcheckFindingsTest, TheDocumentedConfigurationIsClean) {
+    const std::string sample = KORVEX_SOURCE_DIR "/docs/samples/config/full.cfg";
+    EXPECT_THAT(run({sample}).out, testing::EndsWith("\nno errors, no warnings\n"));
+    EXPECT_EQ(run({sample}).status, 0);
+}
+
 // The library, reading the same file in a program, logs nothing that the tool does not tell, and
 // the other way round as far as errors go.
 TEST_F(LogcheckFindingsTest, ItTellsWhatTheLibraryLogs) {

@@ -21,6 +21,10 @@ constexpr std::string_view kIso8601 = "%Y-%m-%d %H:%M:%S,%l";
 // bound beyond which an empty result is no longer taken for a buffer too small.
 constexpr unsigned long kAmpleOutput = 4UL << 20;
 
+constexpr unsigned long kFirstBuffer = 64;  // bytes that strftime(3) is offered first
+
+constexpr std::size_t kLongestNumber = 4;  // a year's digits
+
 std::string_view choosePattern(const char* name, unsigned long len) {
     if (name == nullptr || len == 0) return kIso8601;
     const std::string_view text(name, len);
@@ -54,8 +58,11 @@ bool isAllAmPm(const char* p) {
 
 // Whether the piece holds no other conversions than those that no locale changes. Written without
 // strftime(3) they take a fifth of the time off a line with an ISO 8601 date. (A text made of these
-// also follows tzset(3) and setlocale(3), as one kept from the last line might not.)
+// also follows tzset(3) and setlocale(3), as one kept from the last line might not.) A piece that
+// may not fit strftime's first buffer is left to it: the buffer's growth shows in a later piece,
+// where a %p wider than the buffer is taken for an empty one.
 bool isAllNumbers(std::string_view piece) {
+    if (piece.size() * kLongestNumber / 2 >= kFirstBuffer) return false;
     for (std::size_t i = 0; i < piece.size(); ++i) {
         if (piece[i] == '\0') return false;
         if (piece[i] == '%' && (++i == piece.size() || !isOneOf(piece[i], "YmdHMS"))) return false;
@@ -94,7 +101,7 @@ char* writeNumber(char* to, char conversion, const struct tm& tm) {
 
 void appendNumbers(std::string& out, const std::string& piece, const struct tm& tm) {
     const std::size_t before = out.size();
-    out.resize(before + piece.size() * 2);  // no number is longer than a year
+    out.resize(before + piece.size() * kLongestNumber / 2);
     char* to = &out[before];
     for (const char* p = piece.c_str(); *p != '\0'; ++p) {
         if (*p == '%') {
@@ -145,7 +152,7 @@ class LogFormattedDate::Scratch {
     }
 
   private:
-    char _local[64];
+    char _local[kFirstBuffer];
     std::unique_ptr<char[]> _heap;
     unsigned long _size = sizeof _local;
 };

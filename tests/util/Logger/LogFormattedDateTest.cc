@@ -183,6 +183,16 @@ TEST_F(LogFormattedDateTest, ALineFollowsAChangeOfTheZoneWithinTheSecond) {
     EXPECT_EQ(date("%H"), "09");
 }
 
+// The first piece that does not fit makes the buffer grow for all that follow.
+TEST_F(LogFormattedDateTest, AWideAmPmPrintsWhereALongPieceCameBefore) {
+    for (const std::size_t before : {10U, 61U, 62U, 63U, 64U, 100U}) {
+        const std::string text(before - 2, 'x');
+        const std::string wide = before < 64 ? "" : std::string(67, ' ') + "PM";
+        EXPECT_EQ(date((text + "%H%l%69p").c_str()), text + "14007" + wide) << before;
+        EXPECT_EQ(date((text + "%I%l%69p").c_str()), text + "02007" + wide) << before;
+    }
+}
+
 TEST_F(LogFormattedDateTest, APieceEndsAtItsFirstNul) {
     EXPECT_EQ(date("\0\0", 2), "");
     EXPECT_EQ(date("a\0b", 3), "a");
