@@ -1,0 +1,2 @@
+#define BENCH_WAL
+#include "sqlite.cc"
