@@ -67,7 +67,10 @@ _korvex_records() {
         case $ended${typed[i]} in
             --) ended=1 ;;
             -f | --file | -i | --input)
-                ((++i < last)) || { _korvex_records_files "$2" && return; }
+                if ((++i == last)); then
+                    _korvex_records_files "$2"
+                    return
+                fi
                 [[ ${typed[i - 1]} != -*f* ]] || file=${typed[i]}
                 ;;
             --file=*) file=${typed[i]#*=} ;;
@@ -83,7 +86,9 @@ _korvex_records() {
     local before=${words[-1]}
     quote=$open
 
-    if [[ -z $ended && $current == -* ]]; then
+    if [[ -z $ended && $current =~ ^--(file|input)= ]]; then
+        _korvex_records_files "$2"
+    elif [[ -z $ended && $current == -* ]]; then
         mapfile -t COMPREPLY < <(compgen -W '--file --long --null --hex --print --input --create
             --force --version --help' -- "$2")
     elif [[ -z $verb ]]; then
