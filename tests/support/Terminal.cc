@@ -20,7 +20,7 @@ constexpr std::chrono::seconds kPatience(30);
 
 Terminal::Terminal(unsigned short columns) : _other(posix_openpt(O_RDWR | O_NOCTTY)) {
     if (_other < 0 || grantpt(_other) != 0 || unlockpt(_other) != 0) std::abort();
-    _own = open(ptsname(_other), O_RDWR | O_NOCTTY);
+    _own = open(name().c_str(), O_RDWR | O_NOCTTY);
     struct winsize size {};
     size.ws_col = columns;
     size.ws_row = 25;
@@ -45,6 +45,10 @@ void Terminal::takeOver() const {
     for (const int fd : {0, 1, 2})
         dup2(_own, fd);
     close(_other);  // so that the shell gets its SIGHUP when the test is gone
+}
+
+std::string Terminal::name() const {
+    return ptsname(_other);
 }
 
 void Terminal::type(const std::string& text) const {

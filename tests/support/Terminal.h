@@ -18,6 +18,9 @@ class Terminal {
     // wants it.
     void takeOver() const;
 
+    // The device that others can open.
+    std::string name() const;
+
     void type(const std::string& text) const;
     // Waits until it shows the text, for half a minute; false when it still does not.
     bool shows(const std::string& text);

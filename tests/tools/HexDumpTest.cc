@@ -15,8 +15,8 @@ TEST(HexDumpTest, TextIsUtf8WithoutControlCharacters) {
 }
 
 TEST(HexDumpTest, WhatCouldMoveTheCursorIsNoText) {
-    for (const std::string& bytes : {"\0"s, "a\033[2J"s, "a\rb"s, "\b"s, "\x7F"s, "\xC2\x80"s,
-                                     "\xC2\x9B"s}) {
+    for (const std::string& bytes :
+         {"\0"s, "a\033[2J"s, "a\rb"s, "\b"s, "\x7F"s, "\xC2\x80"s, "\xC2\x9B"s}) {
         EXPECT_FALSE(isText(bytes)) << testing::PrintToString(bytes);
     }
 }

@@ -33,7 +33,8 @@ TEST(ProgressLineTest, ItNeverIsWiderThanItMay) {
     EXPECT_EQ(lineOf(1, 2, 13), "scanning  50%");
     EXPECT_EQ(lineOf(1, 2, 12), "scanning  50");
     EXPECT_EQ(lineOf(1, 2, 0), "");
-    EXPECT_EQ(lineOf(1, 2, 1000), "scanning [" + std::string(20, '#') + std::string(20, '.') + "]  50%");
+    EXPECT_EQ(lineOf(1, 2, 1000),
+              "scanning [" + std::string(20, '#') + std::string(20, '.') + "]  50%");
 }
 
 TEST(ProgressLineTest, WithoutATotalAMarkMovesThereAndBack) {

@@ -8,7 +8,7 @@
 
 #include "Progress.h"
 #include "Status.h"
-#include "Terminal.h"
+#include "support/Terminal.h"
 
 namespace {
 

@@ -10,7 +10,7 @@
 #include <thread>
 
 #include "ProgressLine.h"
-#include "Terminal.h"
+#include "support/Terminal.h"
 
 namespace {
 

@@ -10,7 +10,7 @@
 #include "Output.h"
 #include "Progress.h"
 #include "RecordStore.h"
-#include "Terminal.h"
+#include "support/Terminal.h"
 
 namespace {
 

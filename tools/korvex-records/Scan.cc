@@ -28,7 +28,6 @@ class Scanner {
     }
 
     Scan run() {
-        progressStep("scanning", _result.bytes);
         while (_result.fault.empty() && _at < _result.bytes) {
             _result.offset = _at;
             readRecord();
@@ -141,6 +140,7 @@ Scan scan(const Pathname& file, const RecordVisitor& visit) {
         return result;
     }
     if (!S_ISREG(st.st_mode)) throw Failure(IO_ERROR, file + " is no regular file");
+    progressStep("scanning", static_cast<std::uint64_t>(st.st_size));
     const Stream stream(file.fopen("rb"));
     if (!stream) throw Failure(IO_ERROR, withErrno("cannot open " + file));
     return Scanner(file, stream.get(), static_cast<std::uint64_t>(st.st_size), visit).run();

@@ -1,4 +1,4 @@
-#include "Terminal.h"
+#include "support/Terminal.h"
 
 #include <sys/ioctl.h>
 #include <unistd.h>
