@@ -49,6 +49,8 @@ _korvex_records_keys() {
         _korvex_records_quoted
         COMPREPLY+=("$key")
     done < <(timeout 2 "$tool" ${file:+-f "$file"} list -0 -- "$prefix" 2> /dev/null)
+    # The shell itself closes the quotes of file names only.
+    [[ ${#COMPREPLY[@]} -ne 1 ]] || COMPREPLY[0]+=$quote
 }
 
 _korvex_records_files() {
