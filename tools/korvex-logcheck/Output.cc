@@ -6,7 +6,7 @@
 #include <cstring>
 
 #include "support/StandardOutput.h"
-#include "support/Terminal.h"
+#include "support/TerminalQuery.h"
 
 namespace {
 

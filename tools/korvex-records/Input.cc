@@ -8,7 +8,7 @@
 
 #include "Progress.h"
 #include "Status.h"
-#include "support/Terminal.h"
+#include "support/TerminalQuery.h"
 
 namespace {
 

@@ -4,7 +4,7 @@
 
 #include "Progress.h"
 #include "support/StandardOutput.h"
-#include "support/Terminal.h"
+#include "support/TerminalQuery.h"
 
 void write(std::string_view bytes) {
     static const bool isShown = isTerminal(STDOUT_FILENO);

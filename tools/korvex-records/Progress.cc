@@ -10,7 +10,7 @@
 #include <thread>
 
 #include "ProgressLine.h"
-#include "support/Terminal.h"
+#include "support/TerminalQuery.h"
 
 namespace {
 

@@ -10,7 +10,7 @@
 #include "Output.h"
 #include "Progress.h"
 #include "RecordStore.h"
-#include "support/Terminal.h"
+#include "support/TerminalQuery.h"
 
 namespace {
 

@@ -1,4 +1,4 @@
-#include "support/Terminal.h"
+#include "support/TerminalQuery.h"
 
 #include <sys/ioctl.h>
 #include <unistd.h>
