@@ -63,9 +63,24 @@ class ProgressTest : public RecordsToolTest {
     int _lock = -1;
 };
 
-// From the carriage return that erases the line on.
-std::string afterLine(const std::string& shown) {
-    return shown.substr(std::min(shown.rfind(" \r"), shown.size() - 2) + 2);
+// What stays to be seen, below the line that the set-up writes.
+std::string left(const std::string& shown) {
+    std::vector<std::string> lines(1);
+    std::size_t column = 0;
+    for (const char c : shown.substr(shown.find('\n') + 1)) {
+        if (c == '\n') lines.emplace_back();
+        if (c == '\n' || c == '\r') {
+            column = 0;
+            continue;
+        }
+        std::string& line = lines.back();
+        line.resize(std::max(line.size(), column + 1), ' ');
+        line[column++] = c;
+    }
+    std::string screen;
+    for (const std::string& line : lines)
+        screen += line.substr(0, line.find_last_not_of(' ') + 1) + '\n';
+    return screen;
 }
 
 TEST_F(ProgressTest, WorkOfMoreThanASecondIsShownAndTheLineIsGoneAtTheEnd) {
@@ -80,7 +95,7 @@ TEST_F(ProgressTest, WorkOfMoreThanASecondIsShownAndTheLineIsGoneAtTheEnd) {
         EXPECT_GE(std::chrono::steady_clock::now() - start, std::chrono::seconds(1));
         releaseLock();
         EXPECT_EQ(work.end(), 0) << arguments[0];
-        EXPECT_EQ(afterLine(work.terminal.shown()), "") << arguments[0];
+        EXPECT_EQ(left(work.terminal.shown()), "\n") << arguments[0];
     }
 }
 
@@ -93,7 +108,7 @@ TEST_F(ProgressTest, CheckShowsHowFarItIs) {
     EXPECT_TRUE(check.terminal.shows("\rscanning [" + std::string(40, '.') + "]   0%"));
     EXPECT_EQ(fcntl(fd, F_SETLEASE, F_UNLCK), 0);
     EXPECT_EQ(check.end(), 0);
-    EXPECT_EQ(afterLine(check.terminal.shown()), "");
+    EXPECT_EQ(left(check.terminal.shown()), "\n");
     close(fd);
     std::signal(SIGIO, SIG_DFL);
 }
@@ -132,7 +147,7 @@ TEST_F(ProgressTest, WhatIsSaidMeanwhileStandsOnALineOfItsOwn) {
     ASSERT_TRUE(diff.terminal.shows("waiting"));
     releaseLock();
     EXPECT_EQ(diff.end(), 3);
-    EXPECT_THAT(afterLine(diff.terminal.shown()),
+    EXPECT_THAT(left(diff.terminal.shown()),
                 StartsWith("korvex-records: " + dir.file("other") + ": damaged"));
 }
 
@@ -142,7 +157,7 @@ TEST_F(ProgressTest, TheOutputOnTheSameTerminalStandsOnLinesOfItsOwn) {
     ASSERT_TRUE(stats.terminal.shows("waiting"));
     releaseLock();
     EXPECT_EQ(stats.end(), 0);
-    EXPECT_THAT(afterLine(stats.terminal.shown()), StartsWith("1 records\n"));
+    EXPECT_THAT(left(stats.terminal.shown()), StartsWith("1 records\n"));
 }
 
 TEST_F(ProgressTest, WithoutATerminalNothingIsShown) {
