@@ -21,6 +21,7 @@ inside() {
     shift
     unshare --mount --fork sh -c '
         mount --make-rprivate / && mount -t proc proc "$0/proc" && mount -t tmpfs tmpfs "$0/tmp" &&
+        mkdir -p "$0/dev/pts" && mount -t devpts -o newinstance,ptmxmode=0666 devpts "$0/dev/pts" &&
         exec chroot "$0" env DEBIAN_FRONTEND=noninteractive HOME=/root LC_ALL=C "$@"' "$root" "$@"
 }
 

@@ -37,7 +37,7 @@ struct Plan {
     std::atomic<bool> persistent{false};
     std::atomic<int> error{0};  // 0 with failAt set: a short count instead of a failure
     std::atomic<unsigned long> limit{kUnlimited};
-    std::atomic<long> shift{0};
+    std::atomic<long long> shift{0};
 };
 
 Plan plans[static_cast<std::size_t>(Call::COUNT)];
@@ -49,7 +49,7 @@ Plan& planOf(Call call) {
 struct Verdict {
     int error = 0;
     unsigned long limit = kUnlimited;
-    long shift = 0;
+    long long shift = 0;
 };
 
 Verdict judge(Call call) {
@@ -166,7 +166,7 @@ bool ShortNth::fired() const {
     return count() >= planOf(_call).failAt;
 }
 
-ShiftNth::ShiftNth(Call call, unsigned long k, long by) : CountCalls(call) {
+ShiftNth::ShiftNth(Call call, unsigned long k, long long by) : CountCalls(call) {
     Plan& plan = planOf(call);
     plan.error = 0;
     plan.limit = kUnlimited;

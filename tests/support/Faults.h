@@ -96,7 +96,7 @@ class ShortNth : public CountCalls {
 // moment that many seconds later.
 class ShiftNth : public CountCalls {
   public:
-    ShiftNth(Call call, unsigned long k, long by);
+    ShiftNth(Call call, unsigned long k, long long by);
 
     bool fired() const;
 };

@@ -6,6 +6,7 @@
 #include <unistd.h>
 
 #include <cerrno>
+#include <stdexcept>
 #include <string>
 #include <utility>
 
@@ -208,6 +209,8 @@ TEST_F(FileDescriptorTest, ATransferBeyondIntMaxIsAShortCount) {
         big.resize(size);
     } catch (const std::bad_alloc&) {
         GTEST_SKIP() << "not enough memory";
+    } catch (const std::length_error&) {
+        GTEST_SKIP() << "no string is that long on this machine";
     }
     FileDescriptor null = Pathname("/dev/null").openCreateOrAppend(Pathname::CREATE_NORMAL);
     EXPECT_EQ(null.write(big.data(), size), 2147483647);
@@ -287,8 +290,11 @@ TEST_F(FileDescriptorTest, SizeSeekAndPosition) {
     EXPECT_TRUE(fd.seek_set(4));
     EXPECT_EQ(fd.curPos(), 4);
     EXPECT_EQ(fd.seekEof(), 10);
-    EXPECT_TRUE(fd.seek_set(5LL << 30));
-    EXPECT_EQ(fd.curPos(), 5LL << 30);
+    const bool wide = sizeof(off_t) == 8;
+    errno = 0;
+    EXPECT_EQ(fd.seek_set(5LL << 30), wide);
+    EXPECT_EQ(errno, wide ? 0 : EOVERFLOW);
+    EXPECT_EQ(fd.curPos(), wide ? 5LL << 30 : 10);
     EXPECT_FALSE(fd.seek_set(-1));
     EXPECT_EQ(errno, EINVAL);
     EXPECT_EQ(fd.sync(), 0);

@@ -55,13 +55,13 @@ TEST(TimevalTest, NowLiesBetweenTwoReadingsOfTheClock) {
 
 TEST(TimevalTest, AClockBeyondTheRangeReadsAsItsNearestEnd) {
     if (sizeof(time_t) < 8) GTEST_SKIP() << "no clock can show it with a time_t of 32 bits";
-    const auto shifted = [](long by) {
+    const auto shifted = [](long long by) {
         const ShiftNth fault(Call::gettimeofday, 1, by);
         return Timeval::now();
     };
     EXPECT_TRUE(same(shifted(INT_MAX), kMax));
-    EXPECT_EQ(shifted(std::numeric_limits<long>::min() / 4).sec(), INT_MIN);
-    const long left = INT_MAX - std::time(nullptr);
+    EXPECT_EQ(shifted(std::numeric_limits<long long>::min() / 4).sec(), INT_MIN);
+    const long long left = INT_MAX - std::time(nullptr);
     // The range's last second has milliseconds like any other. (The clock may go on between.)
     Timeval last = shifted(left);
     for (int i = 0; i < 10 && last.msec() == 999; ++i)
