@@ -21,7 +21,7 @@ install(DIRECTORY docs DESTINATION ${CMAKE_INSTALL_DATADIR}/doc/korvex-doc
   COMPONENT documentation EXCLUDE_FROM_ALL
   PATTERN Doxyfile EXCLUDE PATTERN doxygen-filter.sh EXCLUDE)
 install(DIRECTORY examples DESTINATION ${CMAKE_INSTALL_DATADIR}/doc/korvex-doc
-  COMPONENT documentation EXCLUDE_FROM_ALL OPTIONAL)
+  COMPONENT documentation EXCLUDE_FROM_ALL REGEX "/examples/CMakeLists\\.txt$" EXCLUDE)
 
 set(CPACK_GENERATOR DEB)
 set(CPACK_PACKAGE_NAME korvex)

@@ -17,8 +17,9 @@ fi
 
 # The programs are linked anew each time, because no rule says that they hold profile.o.
 tests=$build/tests/korvex-tests
-tool=$build/tools/korvex-records/korvex-records
-rm -f "$tests" "$tool"
+records=$build/tools/korvex-records/korvex-records
+logcheck=$build/tools/korvex-logcheck/korvex-logcheck
+rm -f "$tests" "$records" "$logcheck"
 mkdir -p "$build"
 "clang++$suffix" -c -O1 scripts/coverage-profile.cc -o "$build/profile.o"
 cmake -S . -B "$build" -G Ninja -DCMAKE_BUILD_TYPE=None -DCMAKE_CXX_COMPILER="clang++$suffix" \
@@ -40,6 +41,6 @@ ctest --test-dir "$build" -j "$jobs" --output-on-failure --progress \
     2> "$build/unreadable.log"
 # A function that only one of the programs uses has no counters in the other, of which llvm-cov
 # warns.
-"llvm-cov$suffix" export -instr-profile "$build/all.profdata" "$tests" -object "$tool" \
-    > "$build/coverage.json" 2> "$build/llvm-cov.log" || { cat "$build/llvm-cov.log" >&2; exit 1; }
+"llvm-cov$suffix" export -instr-profile "$build/all.profdata" "$tests" -object "$records" \
+    -object "$logcheck" > "$build/coverage.json" 2> "$build/llvm-cov.log" || { cat "$build/llvm-cov.log" >&2; exit 1; }
 python3 scripts/coverage-report.py . tests/coverage-exempt.txt "$build/coverage.json"

@@ -1,6 +1,8 @@
 #!/bin/sh
 # Installs the library into a temporary prefix, then builds and runs a small stranger against it.
-# Usage: run.sh SOURCE-DIR static|shared|system find_package|pkg-config|add_subdirectory BUILD-DIR CXX
+# Usage: run.sh SOURCE-DIR static|shared|system WAY BUILD-DIR CXX [RECORDS]
+# WAY is find_package, pkg-config, add_subdirectory, or examples: those are built instead, and run with
+# the record tool RECORDS.
 # BUILD-DIR holds the library's build, which the ways of one kind share. The kind "system" is static,
 # on a system that has xmlwrapp (a stand-in for it, fake-xmlwrapp). add_subdirectory installs nothing.
 set -eu
@@ -35,6 +37,10 @@ PKG_CONFIG_PATH="$pc_dir:${PKG_CONFIG_PATH:-}" CMAKE_PREFIX_PATH="$prefix/moved"
 LD_LIBRARY_PATH=$(dirname "$pc_dir")
 export PKG_CONFIG_PATH CMAKE_PREFIX_PATH LD_LIBRARY_PATH
 
+if [ "$way" = examples ]; then
+    CXX="$cxx" PATH="$(dirname "$6"):$PATH" "$source/tests/examples/walk.sh" "$source/examples"
+    exit
+fi
 "$source/tests/stranger/use.sh" "$source" $linkage "$way" "$prefix/build" "$cxx"
 [ "$(pkg-config --variable=xmlwrapp korvex)" = $xmlwrapp ]
 grep -q "set(Korvex_XMLWRAPP \"$xmlwrapp\")" "$(dirname "$pc_dir")/cmake/Korvex/KorvexConfig.cmake"

@@ -46,6 +46,13 @@ class Capture {
     std::exit(result);
 }
 
+// An emulator of a foreign machine adds a line of its own when its program is killed by a signal.
+void dropEmulatorsLine(ChildResult& result) {
+    if (result.signal == 0 || std::getenv("KORVEX_EMULATOR") == nullptr) return;
+    const std::size_t at = result.err.rfind("qemu: uncaught target signal ");
+    if (at != std::string::npos) result.err.erase(at);
+}
+
 }  // namespace
 
 ChildResult runInChild(const std::function<int()>& body, unsigned seconds) {
@@ -65,6 +72,7 @@ ChildResult runInChild(const std::function<int()>& body, unsigned seconds) {
     if (WIFSIGNALED(status)) result.signal = WTERMSIG(status);
     result.out = out.text();
     result.err = err.text();
+    dropEmulatorsLine(result);
     return result;
 }
 

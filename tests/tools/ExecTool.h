@@ -5,8 +5,11 @@
 
 namespace testsupport {
 
-// In a child: becomes korvex-records, through the emulator that KORVEX_EMULATOR names where the
-// tests are for another machine. Returns only when that failed.
+// In a child: becomes the program at the path, through the emulator that KORVEX_EMULATOR names
+// where the tests are for another machine. Returns only when that failed.
+void execProgram(const std::string& path, const std::vector<std::string>& arguments);
+
+// The same with korvex-records.
 void execTool(const std::vector<std::string>& arguments);
 
 // The same with korvex-logcheck.

@@ -9,6 +9,7 @@
 #include <utility>
 #include <vector>
 
+#include "support/Terminal.h"
 #include "tools/LogcheckTool.h"
 
 namespace {
@@ -24,6 +25,7 @@ using testsupport::execLogcheck;
 using testsupport::LogcheckToolTest;
 using testsupport::readFile;
 using testsupport::runInChild;
+using testsupport::Terminal;
 using testsupport::writeFile;
 
 using KorvexLogcheckTest = LogcheckToolTest;
@@ -219,31 +221,17 @@ TEST_F(KorvexLogcheckTest, ALostOutputIsStatusTwo) {
 // Runs the tool with a terminal as its standard output and gives what that shows.
 std::string onTerminal(const std::string& file,
                        const std::vector<std::pair<std::string, std::string>>& environment) {
-    const int terminal = posix_openpt(O_RDWR | O_NOCTTY);
-    EXPECT_EQ(grantpt(terminal), 0);
-    EXPECT_EQ(unlockpt(terminal), 0);
-    const std::string name = ptsname(terminal);
-    // Held open, so that what is written stays to be read.
-    const int slave = open(name.c_str(), O_RDWR | O_NOCTTY);
+    Terminal terminal;
     runInChild([&] {
         setenv("TERM", "xterm", 1);
         unsetenv("NO_COLOR");
         for (const auto& [key, value] : environment)
             setenv(key.c_str(), value.c_str(), 1);
-        dup2(slave, STDOUT_FILENO);
+        terminal.becomes(STDOUT_FILENO);
         execLogcheck({file});
         return 127;
     });
-    // What is written may come in pieces, and late: the mark comes last.
-    EXPECT_EQ(write(slave, "\004", 1), 1);
-    std::string shown;
-    char buf[4096];
-    for (ssize_t got;
-         shown.find('\004') == shown.npos && (got = read(terminal, buf, sizeof buf)) > 0;)
-        shown.append(buf, static_cast<std::size_t>(got));
-    close(slave);
-    close(terminal);
-    return shown;
+    return terminal.shown();
 }
 
 TEST_F(KorvexLogcheckTest, ThereAreColoursOnATerminalOnly) {
@@ -256,8 +244,8 @@ TEST_F(KorvexLogcheckTest, ThereAreColoursOnATerminalOnly) {
 
 TEST_F(KorvexLogcheckTest, NoColorAndADumbTerminalAreRespected) {
     configure("x\n");
-    EXPECT_THAT(onTerminal(file, {{"NO_COLOR", "1"}}), StartsWith("root\r\n"));
-    EXPECT_THAT(onTerminal(file, {{"TERM", "dumb"}}), StartsWith("root\r\n"));
+    EXPECT_THAT(onTerminal(file, {{"NO_COLOR", "1"}}), StartsWith("root\n"));
+    EXPECT_THAT(onTerminal(file, {{"TERM", "dumb"}}), StartsWith("root\n"));
     EXPECT_THAT(onTerminal(file, {{"NO_COLOR", ""}}), StartsWith("\033[1m"));
 }
 

@@ -3,8 +3,8 @@
 #include <exception>
 
 #include "Options.h"
-#include "Output.h"
 #include "Report.h"
+#include "support/StandardOutput.h"
 
 namespace {
 

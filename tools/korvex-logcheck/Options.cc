@@ -1,21 +1,11 @@
 #include "Options.h"
 
-#include <popt.h>
-
-#include <cstdio>
 #include <cstdlib>
-#include <memory>
-#include <vector>
 
-#include "Output.h"
 #include "Status.h"
+#include "support/CommandLine.h"
 
 namespace {
-
-struct FreeContext {
-    void operator()(poptContext context) const { poptFreeContext(context); }
-};
-using Context = std::unique_ptr<poptContext_s, FreeContext>;
 
 enum Action { VERSION = 'V', HELP = '?', HOME = 'H', CHANNEL = 'c' };
 
@@ -28,19 +18,11 @@ const poptOption optionTable[] = {
     {nullptr, '\0', 0, nullptr, 0, nullptr, nullptr},
 };
 
-std::string takeText(poptContext context) {
-    const std::unique_ptr<char, decltype(&std::free)> text(poptGetOptArg(context), &std::free);
-    return text ? text.get() : "";
-}
-
-void act(int action, poptContext context, Options& options) {
-    if (action == HOME) options.home = takeText(context);
-    if (action == CHANNEL) options.channel = takeText(context);
-    if (action == HELP) poptPrintHelp(context, stdout, 0);
-    if (action == VERSION) std::puts("korvex-logcheck " KORVEX_VERSION);
-    if (action != HELP && action != VERSION) return;
-    finishOutput();
-    std::exit(CLEAN);
+void act(int action, const CommandLine& line, Options& options) {
+    if (action == HOME) options.home = line.argument();
+    if (action == CHANNEL) options.channel = line.argument();
+    if (action == HELP) line.showHelp();
+    if (action == VERSION) line.showVersion();
 }
 
 Pathname takeFile(poptContext context) {
@@ -54,25 +36,18 @@ Pathname takeFile(poptContext context) {
 }  // namespace
 
 Options parseOptions(int argc, const char* const* argv) {
-    std::vector<const char*> arguments(argv, argv + argc);
-    if (arguments.empty()) arguments.push_back("korvex-logcheck");
-    arguments.push_back(nullptr);
-    const Context context(poptGetContext("korvex-logcheck", static_cast<int>(arguments.size()) - 1,
-                                         arguments.data(), optionTable, 0));
-    poptSetOtherOptionHelp(context.get(), "FILE [--home DIR] [--channel NAME]");
+    const CommandLine line("korvex-logcheck", argc, argv, optionTable,
+                           "FILE [--home DIR] [--channel NAME]");
     Options options;
     const char* const home = std::getenv("KORVEX_HOME");
     if (home != nullptr) options.home = home;
     int rc = 0;
-    while ((rc = poptGetNextOpt(context.get())) > 0)
-        act(rc, context.get(), options);
-    if (rc != -1) {
-        throw Failure(std::string(poptBadOption(context.get(), POPT_BADOPTION_NOALIAS)) + ": " +
-                      poptStrerror(rc));
-    }
+    while ((rc = poptGetNextOpt(line.get())) > 0)
+        act(rc, line, options);
+    if (rc != -1) throw Failure(line.complaint(rc));
     // As a program's set-up tidies its home.
     options.home.removeDoubleSeps();
     options.home.removeTrailingSeps();
-    options.file = takeFile(context.get());
+    options.file = takeFile(line.get());
     return options;
 }

@@ -7,7 +7,7 @@ constexpr std::size_t kAny = static_cast<std::size_t>(-1);
 constexpr Command kCommands[] = {
     {"list", 0, 1, runList},        {"get", 1, 1, runGet},   {"put", 1, 2, runPut},
     {"remove", 1, kAny, runRemove}, {"dump", 0, 1, runDump}, {"load", 0, 1, runLoad},
-    {"check", 0, 0, runCheck},
+    {"check", 0, 0, runCheck},      {"diff", 1, 1, runDiff}, {"stats", 0, 1, runStats},
 };
 
 }  // namespace

@@ -22,6 +22,8 @@ Status runList(const Options& options, const std::vector<std::string>& arguments
 Status runGet(const Options& options, const std::vector<std::string>& arguments);
 Status runDump(const Options& options, const std::vector<std::string>& arguments);
 Status runCheck(const Options& options, const std::vector<std::string>& arguments);
+Status runDiff(const Options& options, const std::vector<std::string>& arguments);
+Status runStats(const Options& options, const std::vector<std::string>& arguments);
 // Those that write.
 Status runPut(const Options& options, const std::vector<std::string>& arguments);
 Status runRemove(const Options& options, const std::vector<std::string>& arguments);

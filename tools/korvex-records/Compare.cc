@@ -6,6 +6,7 @@
 #include <memory>
 #include <string_view>
 
+#include "Progress.h"
 #include "Stream.h"
 
 namespace {
@@ -45,8 +46,11 @@ bool fileHolds(const Pathname& file, const std::vector<RecordStore::Record>& rec
     if (!stream) return false;
     Comparison comparison(stream.get());
     if (!comparison.record("_record-file-version", "2.0")) return false;
+    progressStep("comparing", records.size());
+    std::uint64_t compared = 0;
     for (const RecordStore::Record& r : records) {
         if (!comparison.record(r.key, r.value)) return false;
+        progressAt(++compared);
     }
     return comparison.atEnd();
 }

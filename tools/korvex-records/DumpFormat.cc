@@ -1,6 +1,7 @@
 #include "DumpFormat.h"
 
 #include "Escape.h"
+#include "Progress.h"
 #include "Status.h"
 
 namespace {
@@ -30,7 +31,10 @@ class DumpParser {
     std::string nextLine() {
         std::string line;
         ++_lineno;
-        if (std::getline(_in, line)) return line;
+        if (std::getline(_in, line)) {
+            progressAt(_bytes += line.size() + 1);
+            return line;
+        }
         if (_in.bad()) throw Failure(IO_ERROR, withErrno("cannot read the dump"));
         fail("the dump ends without its last line, DATA=END");
     }
@@ -80,6 +84,7 @@ class DumpParser {
 
     std::istream& _in;
     unsigned long _lineno = 0;
+    std::uint64_t _bytes = 0;
     bool _print = false;
 };
 

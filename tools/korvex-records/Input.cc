@@ -6,12 +6,16 @@
 
 #include <cerrno>
 
+#include "Progress.h"
 #include "Status.h"
+#include "support/TerminalQuery.h"
 
 namespace {
 
 // Whole-buffer reads: fewer bytes are the end, or an error that errno tells.
 std::string readAll(const FileDescriptor& in, const std::string& name) {
+    // Where somebody types, nothing must be drawn over it.
+    if (!isTerminal(in.osdep())) progressStep("reading the input");
     std::string all;
     std::string piece(1 << 16, '\0');
     for (std::size_t got = piece.size(); got == piece.size();) {

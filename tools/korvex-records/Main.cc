@@ -8,7 +8,7 @@
 #include <exception>
 
 #include "Commands.h"
-#include "Output.h"
+#include "support/StandardOutput.h"
 
 namespace {
 
@@ -56,7 +56,7 @@ int main(int argc, char** argv, char** envp) {
     } catch (const Failure& failure) {
         complain(failure.what());
         return failure.status();
-    } catch (const std::exception& e) {
+    } catch (const std::exception& e) {  // the output is lost, for one
         complain(e.what());
         return IO_ERROR;
     }

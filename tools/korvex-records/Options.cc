@@ -1,21 +1,11 @@
 #include "Options.h"
 
-#include <popt.h>
-
-#include <cstdio>
-#include <cstdlib>
-#include <memory>
 #include <vector>
 
-#include "Output.h"
 #include "Status.h"
+#include "support/CommandLine.h"
 
 namespace {
-
-struct FreeContext {
-    void operator()(poptContext context) const { poptFreeContext(context); }
-};
-using Context = std::unique_ptr<poptContext_s, FreeContext>;
 
 enum Action { VERSION = 'V', HELP = '?', FILE_NAME = 'f', INPUT = 'i' };
 
@@ -31,7 +21,8 @@ struct Received {
 std::vector<poptOption> optionTable(Received& to) {
     return {
         {"file", 'f', POPT_ARG_STRING, nullptr, FILE_NAME, "use this record file", "FILE"},
-        {"long", 'l', POPT_ARG_NONE, &to.longList, 0, "list: with the values' sizes", nullptr},
+        {"long", 'l', POPT_ARG_NONE, &to.longList, 0, "list, diff: with the values' sizes",
+         nullptr},
         {"null", '0', POPT_ARG_NONE, &to.nulSeparated, 0, "list: raw keys, each ended by a NUL",
          nullptr},
         {"hex", 'x', POPT_ARG_NONE, &to.hex, 0, "get: the value as hex digits", nullptr},
@@ -47,20 +38,11 @@ std::vector<poptOption> optionTable(Received& to) {
     };
 }
 
-std::string takeText(poptContext context) {
-    const std::unique_ptr<char, decltype(&std::free)> text(poptGetOptArg(context), &std::free);
-    return text ? text.get() : "";
-}
-
-void act(int action, poptContext context, Options& options) {
-    if (action == FILE_NAME) options.file = takeText(context);
-    if (action == INPUT) options.input = takeText(context);
-    // popt's own help would not notice when its output is lost.
-    if (action == HELP) poptPrintHelp(context, stdout, 0);
-    if (action == VERSION) std::puts("korvex-records " KORVEX_VERSION);
-    if (action != HELP && action != VERSION) return;
-    finishOutput();
-    std::exit(DONE);
+void act(int action, const CommandLine& line, Options& options) {
+    if (action == FILE_NAME) options.file = line.argument();
+    if (action == INPUT) options.input = line.argument();
+    if (action == HELP) line.showHelp();
+    if (action == VERSION) line.showVersion();
 }
 
 }  // namespace
@@ -68,28 +50,21 @@ void act(int action, poptContext context, Options& options) {
 Options parseOptions(int argc, const char* const* argv) {
     Received received;
     const std::vector<poptOption> table = optionTable(received);
-    std::vector<const char*> arguments(argv, argv + argc);
-    if (arguments.empty()) arguments.push_back("korvex-records");
-    arguments.push_back(nullptr);
-    const Context context(poptGetContext("korvex-records", static_cast<int>(arguments.size()) - 1,
-                                         arguments.data(), table.data(), 0));
-    poptSetOtherOptionHelp(context.get(),
-                           "[OPTION...] list|get|put|remove|dump|load|check [ARGUMENT...]");
+    const CommandLine line(
+        "korvex-records", argc, argv, table.data(),
+        "[OPTION...] list|get|put|remove|dump|load|check|diff|stats [ARGUMENT...]");
     Options options;
     int rc = 0;
-    while ((rc = poptGetNextOpt(context.get())) > 0)
-        act(rc, context.get(), options);
-    if (rc != -1) {
-        throw Failure(USAGE, std::string(poptBadOption(context.get(), POPT_BADOPTION_NOALIAS)) +
-                                 ": " + poptStrerror(rc));
-    }
+    while ((rc = poptGetNextOpt(line.get())) > 0)
+        act(rc, line, options);
+    if (rc != -1) throw Failure(USAGE, line.complaint(rc));
     options.longList = received.longList != 0;
     options.nulSeparated = received.nulSeparated != 0;
     options.hex = received.hex != 0;
     options.print = received.print != 0;
     options.create = received.create != 0;
     options.force = received.force != 0;
-    if (const char** rest = poptGetArgs(context.get())) {
+    if (const char** rest = poptGetArgs(line.get())) {
         while (*rest != nullptr)
             options.words.emplace_back(*rest++);
     }

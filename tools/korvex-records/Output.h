@@ -2,8 +2,6 @@
 
 #include <string_view>
 
-// Standard output, whose loss is noticed: both throw Failure IO_ERROR.
-
+// To standard output, out of the way of what shows the progress. Throws std::runtime_error when it
+// is lost.
 void write(std::string_view bytes);
-// Before the tool ends: all of it has gone where it should.
-void finishOutput();

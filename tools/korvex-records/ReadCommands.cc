@@ -1,24 +1,21 @@
+#include <unistd.h>
+
 #include <cstdio>
 
 #include "Commands.h"
 #include "DumpFormat.h"
 #include "Escape.h"
+#include "HexDump.h"
+#include "LongList.h"
 #include "Output.h"
+#include "Progress.h"
 #include "RecordStore.h"
+#include "support/TerminalQuery.h"
 
 namespace {
 
 std::string prefixOf(const std::vector<std::string>& arguments) {
     return arguments.empty() ? "" : arguments.front();
-}
-
-// What was asked for, unless the file it comes from is damaged: that must not go unsaid.
-Status unlessDamaged(const RecordStore& store, Status status) {
-    const Scan& scanned = store.scanned();
-    if (scanned.whole()) return status;
-    complain(store.file() + ": damaged at offset " + std::to_string(scanned.offset) + ": " +
-             scanned.fault);
-    return DAMAGED;
 }
 
 std::string listed(const RecordStore::Record& record, const Options& options) {
@@ -32,14 +29,28 @@ std::string listed(const RecordStore::Record& record, const Options& options) {
     return line + escaped(record.key) + '\n';
 }
 
+void writeValue(const std::string& value, const Options& options) {
+    if (options.hex) {
+        write(toHex(value) + "\n");
+    } else if (isTerminal(STDOUT_FILENO) && !isText(value)) {
+        write(hexDump(value));
+    } else {
+        write(value);
+    }
+}
+
 }  // namespace
 
 Status runList(const Options& options, const std::vector<std::string>& arguments) {
     const RecordStore store(options);
     const auto records = store.enumerate(prefixOf(arguments));
-    for (const auto& record : records)
-        write(listed(record, options));
-    return unlessDamaged(store, records.empty() ? NOT_FOUND : DONE);
+    if (options.longList && !options.nulSeparated && isTerminal(STDOUT_FILENO)) {
+        write(records.empty() ? "" : longList(records, columnsOf(STDOUT_FILENO)));
+    } else {
+        for (const auto& record : records)
+            write(listed(record, options));
+    }
+    return unlessDamaged(store.file(), store.scanned(), records.empty() ? NOT_FOUND : DONE);
 }
 
 Status runGet(const Options& options, const std::vector<std::string>& arguments) {
@@ -47,24 +58,29 @@ Status runGet(const Options& options, const std::vector<std::string>& arguments)
     std::string value;
     const bool found = store.get(arguments.front(), value);
     if (!found) complain(escaped(arguments.front()) + ": no such key");
-    if (found) write(options.hex ? toHex(value) + "\n" : value);
-    return unlessDamaged(store, found ? DONE : NOT_FOUND);
+    if (found) writeValue(value, options);
+    return unlessDamaged(store.file(), store.scanned(), found ? DONE : NOT_FOUND);
 }
 
 Status runDump(const Options& options, const std::vector<std::string>& arguments) {
+    const ProgressDisplay display;
     const RecordStore store(options);
     const auto records = store.enumerate(prefixOf(arguments));
+    progressStep("writing", records.size());
     write(dumpHeader(options.print));
+    std::uint64_t written = 0;
     for (const auto& record : records) {
         write(dumpLine(record.key, options.print));
         write(dumpLine(record.value, options.print));
+        progressAt(++written);
     }
     write(dumpTrailer());
-    return unlessDamaged(store, records.empty() ? NOT_FOUND : DONE);
+    return unlessDamaged(store.file(), store.scanned(), records.empty() ? NOT_FOUND : DONE);
 }
 
 // Takes no lock and restores no copy: it changes nothing at all.
 Status runCheck(const Options& options, const std::vector<std::string>&) {
+    const ProgressDisplay display;
     const Pathname file = recordFilePath(options);
     const Scan scanned = scan(file);
     if (scanned.missing) throw Failure(IO_ERROR, file + ": no such file");

@@ -13,6 +13,7 @@
 #include <memory>
 
 #include "Compare.h"
+#include "Progress.h"
 #include "SafeCopy.h"
 #include "Status.h"
 
@@ -81,6 +82,7 @@ RecordStore::~RecordStore() {
 // Without a lock file, which a directory that may only be read does not allow, nobody can be
 // writing either.
 void RecordStore::lock() {
+    progressStep("waiting for another run");
     const Pathname name(_file + ".lock");
     _lock = FileDescriptor(::open(name.c_str(), O_RDONLY | O_CREAT | O_NOFOLLOW | O_CLOEXEC, 0600));
     if (!_lock.valid()) return;
@@ -90,6 +92,7 @@ void RecordStore::lock() {
 }
 
 void RecordStore::load() {
+    progressStep("reading");
     manager().setDBFile(_file);
     try {
         manager().readFile();
@@ -151,6 +154,7 @@ bool RecordStore::remove(const std::string& key) {
 }
 
 void RecordStore::save() {
+    progressStep("saving");
     manager().saveToFile();
     confirm();
 }

@@ -4,6 +4,7 @@
 
 #include <unistd.h>
 
+#include "Progress.h"
 #include "Status.h"
 
 namespace {
@@ -29,6 +30,7 @@ bool takeAttributes(const Pathname& from, const Pathname& to) {
 }
 
 void makeSafeCopy(const Pathname& file, const Pathname& copy) {
+    progressStep("copying");
     const Pathname unfinished(copy + ".unfinished");
     if (!copyWhole(file, unfinished) || !unfinished.renameTo(copy)) {
         const std::string why = withErrno("cannot make a copy of " + file);

@@ -8,7 +8,7 @@
 #include <set>
 
 #include "Escape.h"
-#include "Status.h"
+#include "Progress.h"
 #include "Stream.h"
 
 namespace {
@@ -22,7 +22,8 @@ bool looksLikeVersionKey(const std::string& key) {
 
 class Scanner {
   public:
-    Scanner(const Pathname& path, std::FILE* file, std::uint64_t size) : _path(path), _file(file) {
+    Scanner(const Pathname& path, std::FILE* file, std::uint64_t size, const RecordVisitor& visit)
+        : _path(path), _file(file), _visit(visit) {
         _result.bytes = size;
     }
 
@@ -30,6 +31,7 @@ class Scanner {
         while (_result.fault.empty() && _at < _result.bytes) {
             _result.offset = _at;
             readRecord();
+            progressAt(_at);
         }
         return _result;
     }
@@ -47,11 +49,12 @@ class Scanner {
         if (!readLength("key", keySize) || !readField("key", keySize, &key)) return;
         if (!readLength("value", valueSize)) return;
         const bool isVersion = looksLikeVersionKey(key);
-        if (!readField("value", valueSize, isVersion ? &value : nullptr)) return;
+        const bool isWanted = isVersion || _visit;
+        if (!readField("value", valueSize, isWanted ? &value : nullptr)) return;
         if (isVersion) {
             acceptVersion(key, value);
         } else {
-            accept(key);
+            accept(key, std::move(value));
         }
     }
 
@@ -63,13 +66,14 @@ class Scanner {
         }
     }
 
-    void accept(const std::string& key) {
+    void accept(const std::string& key, std::string&& value) {
         if (key.find('\0') != key.npos) {
             fault("key \"" + escaped(key) + "\" holds a NUL");
         } else if (!_keys.insert(key).second) {
             fault("key \"" + escaped(key) + "\" stands twice");
         } else {
             ++_result.records;
+            if (_visit) _visit(key, std::move(value));
         }
     }
 
@@ -114,6 +118,7 @@ class Scanner {
 
     const Pathname& _path;
     std::FILE* const _file;
+    const RecordVisitor& _visit;
     std::uint64_t _at = 0;
     Scan _result;
     std::set<std::string> _keys;
@@ -125,7 +130,7 @@ bool isRefusedKey(const std::string& key) {
     return looksLikeVersionKey(key) || key.find('\0') != key.npos;
 }
 
-Scan scan(const Pathname& file) {
+Scan scan(const Pathname& file, const RecordVisitor& visit) {
     // Looked at before it is opened: a FIFO would hold us up for ever.
     struct stat st {};
     if (!file.stat(&st)) {
@@ -135,7 +140,14 @@ Scan scan(const Pathname& file) {
         return result;
     }
     if (!S_ISREG(st.st_mode)) throw Failure(IO_ERROR, file + " is no regular file");
+    progressStep("scanning", static_cast<std::uint64_t>(st.st_size));
     const Stream stream(file.fopen("rb"));
     if (!stream) throw Failure(IO_ERROR, withErrno("cannot open " + file));
-    return Scanner(file, stream.get(), static_cast<std::uint64_t>(st.st_size)).run();
+    return Scanner(file, stream.get(), static_cast<std::uint64_t>(st.st_size), visit).run();
+}
+
+Status unlessDamaged(const Pathname& file, const Scan& scanned, Status status) {
+    if (scanned.whole()) return status;
+    complain(file + ": damaged at offset " + std::to_string(scanned.offset) + ": " + scanned.fault);
+    return DAMAGED;
 }

@@ -3,7 +3,10 @@
 #include <korvex/util/Pathname.h>
 
 #include <cstdint>
+#include <functional>
 #include <string>
+
+#include "Status.h"
 
 // What a strict look at a record file found. Stricter than loading, which keeps what it can: here a
 // fault is whatever a load and a save would not bring back as it is.
@@ -22,5 +25,11 @@ struct Scan {
 // NUL.
 bool isRefusedKey(const std::string& key);
 
+// Is given each record before the first fault, in the file's order.
+using RecordVisitor = std::function<void(const std::string& key, std::string&& value)>;
+
 // Reads only. Throws Failure IO_ERROR when a file that is there cannot be read or is none.
-Scan scan(const Pathname& file);
+Scan scan(const Pathname& file, const RecordVisitor& visit = {});
+
+// What was asked for, unless the file it comes from is damaged: that must not go unsaid.
+Status unlessDamaged(const Pathname& file, const Scan& scanned, Status status);

@@ -4,10 +4,13 @@
 #include <cstdio>
 #include <cstring>
 
+#include "Progress.h"
+
 std::string withErrno(const std::string& message) {
     return message + ": " + std::strerror(errno);
 }
 
 void complain(const std::string& message) {
+    progressAside();
     std::fprintf(stderr, "korvex-records: %s\n", message.c_str());
 }

@@ -4,6 +4,7 @@
 #include "DumpFormat.h"
 #include "Escape.h"
 #include "Input.h"
+#include "Progress.h"
 #include "RecordStore.h"
 
 namespace {
@@ -50,8 +51,10 @@ Status runRemove(const Options& options, const std::vector<std::string>& argumen
 }
 
 Status runLoad(const Options& options, const std::vector<std::string>& arguments) {
+    const ProgressDisplay display;
     std::istringstream dump(arguments.empty() ? readStandardInput()
                                               : readInputFile(arguments.front()));
+    progressStep("parsing", static_cast<std::uint64_t>(dump.rdbuf()->in_avail()));
     const Records records = parseDump(dump);
     for (const auto& record : records) {
         if (isRefusedKey(record.first)) {
@@ -61,8 +64,12 @@ Status runLoad(const Options& options, const std::vector<std::string>& arguments
     }
     RecordStore store(options);
     store.beginChange();
-    for (const auto& [key, value] : records)
+    progressStep("storing", records.size());
+    std::uint64_t stored = 0;
+    for (const auto& [key, value] : records) {
         store.put(key, value);
+        progressAt(++stored);
+    }
     store.save();
     return DONE;
 }
