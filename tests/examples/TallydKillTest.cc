@@ -4,15 +4,28 @@
 
 #include <csignal>
 #include <cstdlib>
+#include <filesystem>
 #include <string>
+#include <utility>
+#include <vector>
 
 #include "examples/RunningTallyd.h"
 #include "support/Sweep.h"
+#include "tools/RecordsTool.h"
 
 namespace {
 
 using testing::Contains;
 using testsupport::TallydTest;
+
+// With enough records that a save takes a while, also where all files are in memory.
+void fillStore(const std::string& directory) {
+    std::vector<std::pair<std::string, std::string>> records;
+    for (int i = 0; i < 20000; ++i)
+        records.emplace_back("filler/" + std::to_string(i), std::string(100, 'x'));
+    std::filesystem::create_directories(directory);
+    testsupport::writeFile(directory + "/data", testsupport::fileOf(records));
+}
 
 TEST_F(TallydTest, AKilledDaemonLosesOnlyWhatItHadNotSaved) {
     ASSERT_EQ(start().status, 0);
@@ -32,6 +45,7 @@ TEST_F(TallydTest, AKilledDaemonLosesOnlyWhatItHadNotSaved) {
 }
 
 TEST_F(TallydTest, AKillInTheMiddleOfASaveLeavesAWholeFile) {
+    fillStore(dir.file("db/hashDb"));
     const std::string half = dir.file("db/hashDb/data.new");  // there while a save is under way
     const auto count = [this] { return std::strtoul(saved("apple").c_str(), nullptr, 10); };
     unsigned long before = 0;
