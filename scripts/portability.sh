@@ -2,6 +2,7 @@
 # Builds and tests Korvex for other machines, in Debian roots of its own below build/portability, and
 # compares the record files that they write. Needs root. Usage: portability.sh [MACHINE...]
 set -euo pipefail
+. scripts/debian-root.sh
 
 here=$PWD/build/portability
 machines=(i386 i386-time64 libc++ arm64 s390x)
@@ -15,37 +16,17 @@ packages_cross="$common qemu-user-static g++-aarch64-linux-gnu g++-s390x-linux-g
 
 root_of() { case $1 in arm64 | s390x) echo cross ;; *) echo native ;; esac; }
 
-# inside ROOT COMMAND...: in that root, with mounts that vanish with the command.
-inside() {
-    local root=$here/$1
-    shift
-    unshare --mount --fork sh -c '
-        mount --make-rprivate / && mount -t proc proc "$0/proc" && mount -t tmpfs tmpfs "$0/tmp" &&
-        mkdir -p "$0/dev/pts" && mount -t devpts -o newinstance,ptmxmode=0666 devpts "$0/dev/pts" &&
-        exec chroot "$0" env DEBIAN_FRONTEND=noninteractive HOME=/root LC_ALL=C "$@"' "$root" "$@"
-}
-
 make_root() {
     local root=$here/$1
     [ ! -e "$root/ready" ] || return 0
-    if [ ! -e "$here/base/ready" ]; then
-        rm -rf --one-file-system "$here/base"
-        mkdir -p "$here"
-        debootstrap --variant=minbase bookworm "$here/base" > "$here/debootstrap.log"
-        cp /etc/resolv.conf "$here/base/etc/"
-        cp /etc/apt/apt.conf.d/99* "$here/base/etc/apt/apt.conf.d/" 2> /dev/null || true
-        touch "$here/base/ready"
-    fi
-    rm -rf --one-file-system "$root"
-    cp -a "$here/base" "$root"
-    rm "$root/ready"
+    new_root "$root"
     local architectures packages
     case $1 in
         native) architectures=i386 packages=$packages_native ;;
         cross) architectures="arm64 s390x" packages=$packages_cross ;;
     esac
     # shellcheck disable=SC2086  # lists
-    inside "$1" sh -c 'for a in $0; do dpkg --add-architecture $a; done; apt-get update -qq &&
+    inside "$root" sh -c 'for a in $0; do dpkg --add-architecture $a; done; apt-get update -qq &&
         apt-get install -y -qq --no-install-recommends "$@"' "$architectures" $packages \
         > "$here/$1-packages.log" 2>&1
     touch "$root/ready"
@@ -70,7 +51,7 @@ build() {
     describe "$machine"
     mkdir -p "$here/$root/korvex"
     git ls-files -z | tar -c --null -T - | tar -x -C "$here/$root/korvex"
-    inside "$root" sh -euc '
+    inside "$here/$root" sh -euc '
         machine=$1 cc=$2 flags=$3 archdir=$4 emulator=$5
         export PKG_CONFIG_LIBDIR=/usr/lib/$archdir/pkgconfig:/usr/share/pkgconfig
         gtest=/korvex-build/$machine/gtest
@@ -95,7 +76,7 @@ run_tests() {
     local machine=$1 root
     root=$(root_of "$machine")
     describe "$machine"
-    inside "$root" env KORVEX_EMULATOR="${emulator:+/usr/bin/$emulator}" sh -euc '
+    inside "$here/$root" env KORVEX_EMULATOR="${emulator:+/usr/bin/$emulator}" sh -euc '
         cd "/korvex-build/$0/korvex/tests"
         $KORVEX_EMULATOR ./korvex-tests --gtest_brief=1 2>&1
         for fuzzer in ../fuzz/fuzz-*; do
@@ -107,7 +88,7 @@ write_records() {
     local machine=$1 root
     root=$(root_of "$machine")
     describe "$machine"
-    inside "$root" env KORVEX_HOME=/tmp KORVEX_DB=/tmp sh -euc '
+    inside "$here/$root" env KORVEX_HOME=/tmp KORVEX_DB=/tmp sh -euc '
         tool="$1 /korvex-build/$0/korvex/tools/korvex-records/korvex-records -f /korvex-build/$0/records"
         rm -f "/korvex-build/$0/records"
         mkdir -p /tmp/etc && echo rootCategory=ERROR > /tmp/etc/log-cmdline.cfg
@@ -123,7 +104,7 @@ read_records() {
     describe "$machine"
     for other in "${machines[@]}"; do
         cp "$here/records-$other" "$here/$root/korvex-build/$machine/other"
-        inside "$root" env KORVEX_HOME=/tmp KORVEX_DB=/tmp sh -euc '
+        inside "$here/$root" env KORVEX_HOME=/tmp KORVEX_DB=/tmp sh -euc '
             mkdir -p /tmp/etc && echo rootCategory=ERROR > /tmp/etc/log-cmdline.cfg
             tool="$1 /korvex-build/$0/korvex/tools/korvex-records/korvex-records -f /korvex-build/$0/other"
             [ "$($tool get a)" = 1 ] && [ "$($tool get long | wc -c)" -eq 2500 ] && $tool check' \

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <korvex/Export.h>
 #include <korvex/util/Pathname.h>
 
 #include <dirent.h>
@@ -9,7 +10,7 @@
 #include <cstdarg>
 #include <string>
 
-inline namespace korvex {
+inline namespace KORVEX_EXPORT korvex {
 
 // A POSIX descriptor number, or -1 for none. A plain value: copies mean the same open file, and
 // nothing closes it by itself. Members neither throw nor log; failure is told by the result, with

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <korvex/Export.h>
 #include <korvex/util/Pathname.h>
 
 #include <sys/types.h>
@@ -10,7 +11,7 @@
 #include <memory>
 #include <string>
 
-inline namespace korvex {
+inline namespace KORVEX_EXPORT korvex {
 
 // How the process was started: its directories (from the environment), its options (from the
 // command line, by popt), its id and start time. Everybody asks the one instance; the main thread

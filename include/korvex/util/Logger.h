@@ -1,6 +1,7 @@
 #pragma once
 
 // The front door of logging: this one include gives all of it.
+#include <korvex/Export.h>
 #include <korvex/util/Logger/LogAppender.h>
 #include <korvex/util/Logger/LogChannel.h>
 #include <korvex/util/Logger/LogEpoch.h>
@@ -16,7 +17,7 @@
 #include <exception>
 #include <string>
 
-inline namespace korvex {
+inline namespace KORVEX_EXPORT korvex {
 
 // A module's voice: a named front end, usually a file-level static, that writes to the channel of
 // the same name. Cheap to build and to copy.

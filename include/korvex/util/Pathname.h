@@ -1,5 +1,7 @@
 #pragma once
 
+#include <korvex/Export.h>
+
 #include <sys/stat.h>
 
 #include <cstdio>
@@ -8,7 +10,7 @@
 #include <string>
 #include <vector>
 
-inline namespace korvex {
+inline namespace KORVEX_EXPORT korvex {
 
 class DirectoryDescriptor;
 class DirectoryEntry;

@@ -1,11 +1,12 @@
 #pragma once
 
+#include <korvex/Export.h>
 #include <korvex/util/ThreadObj.h>
 
 #include <cstddef>
 #include <memory>
 
-inline namespace korvex {
+inline namespace KORVEX_EXPORT korvex {
 
 // A piece of work that is handed to another thread to run, through an InThreadActorQueue.
 class InThreadActor {

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <korvex/Export.h>
 #include <korvex/util/ThreadSafety.h>
 
 #include <pthread.h>
@@ -7,7 +8,7 @@
 #include <cstdint>
 #include <stdexcept>
 
-inline namespace korvex {
+inline namespace KORVEX_EXPORT korvex {
 
 // What a failed thread-library call becomes: what() names the thread, the call and the error.
 class PthreadException : public std::runtime_error {

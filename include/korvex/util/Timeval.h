@@ -1,11 +1,13 @@
 #pragma once
 
+#include <korvex/Export.h>
+
 #include <sys/time.h>
 
 #include <ctime>
 #include <string>
 
-inline namespace korvex {
+inline namespace KORVEX_EXPORT korvex {
 
 // A wall-clock instant: seconds and microseconds since the Unix epoch. Seconds keep to the signed
 // 32-bit range whatever the platform's time_t is: additions and the clock saturate at the largest
@@ -86,7 +88,7 @@ class CurrentTimeval : public Timeval {
 // millisecond rounds up, and a positive duration is never less than 1. A number too large for 64
 // bits gives 18446744073709551615 and success. False, *res 0 and *charCount 0, when there is
 // nothing to read. p must be NUL-terminated.
-bool convert_string_to_milliseconds(const char* p, unsigned long long* res,
-                                    unsigned long* charCount);
+KORVEX_EXPORT bool convert_string_to_milliseconds(const char* p, unsigned long long* res,
+                                                  unsigned long* charCount);
 
 }  // namespace korvex

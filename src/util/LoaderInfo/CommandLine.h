@@ -12,7 +12,7 @@ inline namespace korvex {
 // popt's view of the command line: the option table, the fields that receive the values, and the
 // parsing context. popt keeps pointers into the argument vector and the table, so they live here,
 // beside it.
-class LoaderInfo::CommandLine {
+class KORVEX_HIDDEN LoaderInfo::CommandLine {
   public:
     CommandLine(int argc, const char* const* argv);
     CommandLine(const CommandLine&) = delete;

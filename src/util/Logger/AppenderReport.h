@@ -9,7 +9,7 @@ inline namespace korvex {
 // A failure met while an appender holds its lock: put into words at once, with the errno of the
 // failed call, and delivered when the lock is free, because the way of the report may lead through
 // other appenders' locks.
-class LogAppender::Report {
+class KORVEX_HIDDEN LogAppender::Report {
   public:
     explicit Report(const LogAppender* appender) : _appender(appender) {}
 

@@ -12,7 +12,7 @@ extern std::atomic<bool> logger_initialized;
 
 // The loggers built before initialisation. Threads may start, build loggers and log early, so the
 // list has a lock; nothing here is called for a bound logger.
-class EarlyLoggers {
+class KORVEX_HIDDEN EarlyLoggers {
   public:
     // Puts the logger on the list, or binds it when initialisation was faster.
     static void add(Logger& logger);

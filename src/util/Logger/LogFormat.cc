@@ -30,7 +30,7 @@ unsigned long long msecSinceEpoch(const LogMsgMetadata& md) {
 }  // namespace
 
 // Produces one line: what the atoms of the line share.
-class LogFormat::Line {
+class KORVEX_HIDDEN LogFormat::Line {
   public:
     Line(std::string& out, const LogMsgMetadata& md, const std::string& msg)
         : _out(out), _md(md), _msg(msg) {}

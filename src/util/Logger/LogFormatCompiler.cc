@@ -123,8 +123,8 @@ bool LogFormat::Compiler::set(Atom& atom, char letter, const char* argBegin, con
             atom.slen = 1;
         } else if (atom.what == Atom::TIME_FMT) {
             const auto len = static_cast<unsigned long>(argEnd - argBegin);
-            _format._dates.push_back(std::make_unique<const LogFormattedDate>(argBegin, len));
-            atom.arg.fdate = _format._dates.back().get();
+            _format._dates.emplace_back(argBegin, len);
+            atom.arg.fdate = &_format._dates.back();
         }
         return true;
     }

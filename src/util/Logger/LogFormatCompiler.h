@@ -5,7 +5,7 @@
 inline namespace korvex {
 
 // Cuts a layout's pattern into its atoms. One object compiles one pattern.
-class LogFormat::Compiler {
+class KORVEX_HIDDEN LogFormat::Compiler {
   public:
     explicit Compiler(LogFormat& format) : _format(format), _p(format._fmt.c_str()) {}
 

@@ -142,7 +142,7 @@ unsigned long CachedTm::ftime(char* buf, unsigned long size, const char* fmt,
 }
 
 // The memory strftime writes to: local at first, grown by doubling, kept for the later pieces.
-class LogFormattedDate::Scratch {
+class KORVEX_HIDDEN LogFormattedDate::Scratch {
   public:
     char* data() { return _heap ? _heap.get() : _local; }
     unsigned long size() const { return _size; }

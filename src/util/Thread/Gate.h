@@ -6,7 +6,7 @@ inline namespace korvex {
 
 // Where a new thread waits for go(). It belongs to the Thread object and to the operating-system
 // thread together: whichever ends later finds it whole.
-class Thread::Gate {
+class KORVEX_HIDDEN Thread::Gate {
   public:
     // Lets the waiting thread run its main(). A failed assertion when it is open already.
     void open();

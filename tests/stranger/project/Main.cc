@@ -16,6 +16,14 @@ void Logger::warn(const char* text) {
 }
 }  // namespace other
 
+class Worker : public Thread {
+  public:
+    Worker() : Thread("worker") {}
+
+  private:
+    void main() override { Logger("stranger").info("hello from %s", currentName()); }
+};
+
 int main(int argc, char** argv) {
     LoaderInfo::getInstance()->init(argc, argv);
     LoaderInfo::getInstance()->setCommonComponentNode(xml::node("stranger", "content"));
@@ -23,6 +31,14 @@ int main(int argc, char** argv) {
     Logger::initialize();
     Logger logger("stranger");
     logger.info("hello from %s", Thread::currentName());
+    Worker worker;
+    worker.go();
+    worker.join();
+    try {
+        const Thread anotherMainThread;
+    } catch (const PthreadException& error) {  // thrown on the other side
+        std::puts(error.what());
+    }
     other::Logger().warn(LoaderInfo::getInstance()->getCommonComponentNode().get_name());
     PersistentHashData data;
     RecordFileManager::instance()->get("key", data);

@@ -4,10 +4,12 @@
 // uses, over the real libxml2. This folder is on the include path only then. The inner namespace
 // keeps the two apart in a program that links both.
 
+#include <korvex/Export.h>
+
 struct _xmlNode;
 
 namespace xml {
-inline namespace korvex_compat {
+inline namespace KORVEX_EXPORT korvex_compat {
 
 // One XML element: a name and its text. A value; copies are deep. Names and contents are
 // NUL-terminated UTF-8 and are copied. Running out of memory throws std::bad_alloc. As thread-safe

@@ -1,9 +1,11 @@
 #pragma once
 
+#include <korvex/Export.h>
+
 #include <stdexcept>
 #include <string>
 
-inline namespace korvex {
+inline namespace KORVEX_EXPORT korvex {
 
 class Logger;
 

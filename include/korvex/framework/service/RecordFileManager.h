@@ -1,5 +1,6 @@
 #pragma once
 
+#include <korvex/Export.h>
 #include <korvex/util/Pathname.h>
 #include <korvex/util/ThreadObj.h>
 
@@ -12,7 +13,7 @@
 #include <utility>
 #include <vector>
 
-inline namespace korvex {
+inline namespace KORVEX_EXPORT korvex {
 
 // One value on its way into or out of the store. Owns nothing: see RecordFileManager::get.
 struct PersistentHashData {

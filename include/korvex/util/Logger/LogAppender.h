@@ -1,5 +1,6 @@
 #pragma once
 
+#include <korvex/Export.h>
 #include <korvex/util/FileDescriptor.h>
 #include <korvex/util/Logger/LogLevel.h>
 #include <korvex/util/Pathname.h>
@@ -11,7 +12,7 @@
 #include <string>
 #include <vector>
 
-inline namespace korvex {
+inline namespace KORVEX_EXPORT korvex {
 
 class LogFormat;
 class LogMsgMetadata;

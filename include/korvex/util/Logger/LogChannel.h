@@ -1,12 +1,13 @@
 #pragma once
 
+#include <korvex/Export.h>
 #include <korvex/util/Logger/LogLevel.h>
 
 #include <atomic>
 #include <string>
 #include <vector>
 
-inline namespace korvex {
+inline namespace KORVEX_EXPORT korvex {
 
 class LogAppender;
 class LogMsgMetadata;

@@ -1,12 +1,13 @@
 #pragma once
 
+#include <korvex/Export.h>
 #include <korvex/util/Timeval.h>
 
-inline namespace korvex {
+inline namespace KORVEX_EXPORT korvex {
 
 // The moment from which the layouts' %r and %R count: when logging was initialised, or the first
 // call of this function if that came earlier. The same object every time, never destroyed; safe
 // from any thread. Aborts when the clock fails, as Timeval does.
-const Timeval& epoch_timeval();
+KORVEX_EXPORT const Timeval& epoch_timeval();
 
 }  // namespace korvex

@@ -1,13 +1,14 @@
 #pragma once
 
+#include <korvex/Export.h>
 #include <korvex/util/Logger/LogLevel.h>
 
 #include <cstdarg>
-#include <memory>
+#include <list>
 #include <string>
 #include <vector>
 
-inline namespace korvex {
+inline namespace KORVEX_EXPORT korvex {
 
 class CachedTm;
 class LogAppender;
@@ -92,7 +93,7 @@ class LogFormat {
 
     std::string _fmt;
     std::vector<Atom> _atoms;
-    std::vector<std::unique_ptr<const LogFormattedDate>> _dates;
+    std::list<LogFormattedDate> _dates;
 };
 
 }  // namespace korvex

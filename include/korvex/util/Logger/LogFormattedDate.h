@@ -1,10 +1,12 @@
 #pragma once
 
+#include <korvex/Export.h>
+
 #include <ctime>
 #include <string>
 #include <vector>
 
-inline namespace korvex {
+inline namespace KORVEX_EXPORT korvex {
 
 class LogMsgMetadata;
 

@@ -1,5 +1,7 @@
 #pragma once
 
+#include <korvex/Export.h>
+
 // A program may well be built with -DDEBUG, or include a header that defines ERROR. The macros are
 // put aside while the enumerators are declared and come back afterwards, so that such a program
 // compiles as long as it does not name these levels itself; where it must, `LogLevel` values are
@@ -23,7 +25,7 @@
 #undef FATAL
 #undef EMERG
 
-inline namespace korvex {
+inline namespace KORVEX_EXPORT korvex {
 
 // How grave a message is. A message passes a channel when its level is greater than or equal to
 // the channel's minimum. Logger has no methods for NOTICE, ALERT and EMERG: they serve as minima.
@@ -41,7 +43,7 @@ enum LogLevel : int {
 
 // The level's name ("DEBUG" ... "EMERG"), or "???" for any other value; its length in bytes goes
 // to *len, which must not be null. The text lives for ever. Never fails; safe from any thread.
-const char* loglevel2str(unsigned long* len, LogLevel level);
+KORVEX_EXPORT const char* loglevel2str(unsigned long* len, LogLevel level);
 
 }  // namespace korvex
 

@@ -1,9 +1,10 @@
 #pragma once
 
+#include <korvex/Export.h>
 #include <korvex/util/Logger/LogLevel.h>
 #include <korvex/util/Timeval.h>
 
-inline namespace korvex {
+inline namespace KORVEX_EXPORT korvex {
 
 class Logger;
 

@@ -37,7 +37,7 @@ bool isVersionKey(std::string_view key) {
 }
 
 // Reads one record file, record by record.
-class RecordFileManager::Loader {
+class KORVEX_HIDDEN RecordFileManager::Loader {
   public:
     Loader(RecordFileManager& store, std::FILE* file) : _store(store), _file(file) {}
 
