@@ -19,6 +19,7 @@ class TallydTest : public testing::Test {
     TallydTest();
     // Kills whatever still runs.
     ~TallydTest() override;
+    void SetUp() override;
 
     // Starts it, with the address and the port; the result is that of the process that was started,
     // which is over when the daemon is ready. `prepare` runs in that process before it becomes the
