@@ -115,7 +115,8 @@ def instructions(row):
         if run(table, name, program_row, 1) is None:  # makes its store
             continue
         output = run(table, name, program_row, calls, tool)
-        counts[name] = round(int(re.search(r"Collected : (\d+)", output.stderr)[1]) / calls, 1)
+        # A child that made the store has told its own count before.
+        counts[name] = round(int(re.findall(r"Collected : (\d+)", output.stderr)[-1]) / calls, 1)
     say("")
     return counts
 

@@ -24,7 +24,8 @@ using testsupport::SweptFault;
 using testsupport::TempDir;
 using testsupport::writeFile;
 
-// Values that take one piece, more than one, and no byte.
+// Values that take one piece, more than one, and no byte; a key that is too long to be written
+// together with the lengths.
 std::map<std::string, std::string> sampleRecords() {
     std::map<std::string, std::string> records;
     for (unsigned i = 0; i < 2 * testsupport::testScale(); ++i) {
@@ -32,6 +33,7 @@ std::map<std::string, std::string> sampleRecords() {
         records["long" + n] = std::string(2500, 'l');
         records["short" + n] = "value " + n;
         records["void" + n] = "";
+        records[std::string(300, 'k') + n] = "long key";
     }
     return records;
 }
@@ -135,9 +137,9 @@ TEST_F(RecordFileSweep, SavingTouchesNoRecordAndTellsWhenTheFileIsNotWhole) {
                   writeFile(_file, old);
                   const bool done = save(fault);
                   const std::string content = readFile(_file);
-                  // The four writes of the version record are not looked at: they go into the
+                  // The two writes of the version record are not looked at: they go into the
                   // stream's empty buffer and cannot fail by themselves.
-                  if (!fault.isOf(Call::fwrite) || fault.k() > 4) {
+                  if (!fault.isOf(Call::fwrite) || fault.k() > 2) {
                       EXPECT_TRUE(content == old || isBeginning(content, whole));
                       if (done && content != whole) {
                           EXPECT_NE(ownStderr(), "");

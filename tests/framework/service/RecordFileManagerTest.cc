@@ -454,7 +454,7 @@ TEST_F(RecordFileManagerTest, AFailingWriteGivesUpAndKeepsMemory) {
     const std::string message =
         "Failed to write record, giving up on saving file.  Error is 28: No space left on "
         "device.\n";
-    for (unsigned long k = 5; k <= 8; ++k) {
+    for (unsigned long k = 3; k <= 6; ++k) {
         EXPECT_EQ(run([&] {
                       put("a", "1");
                       put("b", "2");
@@ -471,6 +471,35 @@ TEST_F(RecordFileManagerTest, AFailingWriteGivesUpAndKeepsMemory) {
         EXPECT_EQ(_out, "a=1;b=2;") << k;
         EXPECT_EQ(readFile(_file),
                   kVersionRecord + record("a", "1") + record("b", "2") + record("c", "3"));
+    }
+}
+
+TEST_F(RecordFileManagerTest, KeysOfAllLengthsLieBetweenTheirLengths) {
+    std::string expected = kVersionRecord;
+    std::vector<std::string> keys;
+    for (const std::size_t length : {0U, 1U, 246U, 247U, 248U, 249U, 255U, 256U, 257U, 5000U}) {
+        keys.emplace_back(length, 'k');
+        expected += record(keys.back(), "value");
+    }
+    EXPECT_EQ(run([&] {
+                  for (const std::string& key : keys)
+                      put(key, "value");
+                  store().saveToFile();
+              }),
+              "");
+    EXPECT_EQ(readFile(_file), expected);
+}
+
+TEST_F(RecordFileManagerTest, AFailingWriteOfALongKeyGivesUp) {
+    for (unsigned long k = 3; k <= 6; ++k) {
+        EXPECT_THAT(run([&] {
+                        put(std::string(249, 'k'), "1");
+                        const FailNth fault(Call::fwrite, k, ENOSPC);
+                        store().saveToFile();
+                        if (!fault.fired()) fputs("not so", stdout);
+                    }),
+                    testing::HasSubstr("Failed to write record"));
+        EXPECT_EQ(_out, "") << k;
     }
 }
 
