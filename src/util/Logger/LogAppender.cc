@@ -2,6 +2,7 @@
 
 #include "base/ThreadText.h"
 #include "util/Logger/AppenderReport.h"
+#include "util/Logger/BriefWait.h"
 #include "util/Logger/NologLock.h"
 #include "util/Logger/RootObjects.h"
 
@@ -41,9 +42,12 @@ void LogAppender::write(const LogMsgMetadata& mdata, const std::string& msg) {
     ThreadText m;
     layout().apply(*m, mdata, msg);
     Report report(this);
+    waitBriefly(_writing);
     {
         const NologLock lock(_mutex);
+        _writing.store(true, std::memory_order_relaxed);
         writeLine(*m, mdata.stamp.sec(), report);
+        _writing.store(false, std::memory_order_relaxed);
     }
     report.deliver();
 }

@@ -8,6 +8,7 @@
 
 #include <sys/types.h>
 
+#include <atomic>
 #include <cstdint>
 #include <string>
 #include <vector>
@@ -105,6 +106,8 @@ class LogAppender {
     dev_t _device KORVEX_GUARDED_BY(_mutex) = 0;
     // Seconds: when that identity was confirmed.
     long long _lastCheck KORVEX_GUARDED_BY(_mutex) = 0;
+    // Whether write() holds the lock just now: a hint to those about to wait for it.
+    std::atomic<bool> _writing{false};
 };
 
 }  // namespace korvex
