@@ -46,7 +46,7 @@ class ThreadText {
     static Texts* makeTexts() noexcept;
     static void dropTexts(void* dropped);
 
-    static constexpr std::size_t kMostKept = 16 * 1024;  // bytes; what grew beyond is freed
+    static constexpr std::size_t kMostKept = 16384;  // bytes; what grew beyond is freed
 
     // Plain values need no construction and no destruction, so they work in exit handlers and in
     // ending threads. The main thread's texts are never freed.

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <cstddef>
 #include <cstdint>
 #include <string_view>
 
@@ -11,17 +12,17 @@ inline namespace korvex {
 inline constexpr std::string_view VERSION_KEY = "_record-file-version";
 inline constexpr std::string_view VERSION_STR = "2.0";
 
-constexpr unsigned kLengthBytes = 4;
+constexpr std::size_t kLengthBytes = 4;
 
 // Lengths are little-endian on every host.
 inline void putLength(unsigned char (&out)[kLengthBytes], std::uint32_t n) {
-    for (unsigned i = 0; i < kLengthBytes; ++i)
+    for (std::size_t i = 0; i < kLengthBytes; ++i)
         out[i] = static_cast<unsigned char>(n >> (8 * i));
 }
 
 inline std::uint32_t getLength(const unsigned char (&in)[kLengthBytes]) {
     std::uint32_t n = 0;
-    for (unsigned i = 0; i < kLengthBytes; ++i)
+    for (std::size_t i = 0; i < kLengthBytes; ++i)
         n |= static_cast<std::uint32_t>(in[i]) << (8 * i);
     return n;
 }

@@ -24,7 +24,7 @@ class RecordStream {
     bool close() { return std::fclose(_file.release()) == 0; }
 
   private:
-    static constexpr std::size_t kSize = 64 * 1024;  // bytes; more gained nothing
+    static constexpr std::size_t kSize = 65536;  // bytes; more gained nothing
 
     std::unique_ptr<char[]> _buffer;  // outlives the stream
     Stream _file;

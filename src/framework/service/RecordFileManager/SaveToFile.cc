@@ -53,6 +53,8 @@ void reportFailedWrite() {
 
 }  // namespace
 
+// The key comes by value because that is the interface.
+// NOLINTNEXTLINE(performance-unnecessary-value-param)
 bool RecordFileManager::writeRecord(std::FILE* outFile, std::string key, unsigned int dataLen,
                                     const void* data) {
     if (outFile == nullptr) {
