@@ -33,11 +33,12 @@ REMARKS = """
   unlocked reads, a buffer of 16 KiB, `malloc` for `calloc`, other ways of inserting.
 - **4 threads on two cores.** Threads that sleep cost the slowest calls, threads that look while others
   work cost throughput. Without looking it is 0.85 of the floor, with a 99th percentile like the floor's;
-  looking for up to 150 turns makes it 0.90, with a third of that percentile; pthread's own adaptive lock
-  made it 1.03, with four times of it. The rest is the file's own lock in the kernel.
+  looking for up to 150 turns makes it 0.9 to 1.0, with less than half of that percentile; pthread's own
+  adaptive lock made it 1.03, with four times of it. The rest is the file's own lock in the kernel.
 - **The text of a date** is made anew for each line, though it changes once a second: keeping it would
   have to see every change of the time zone, and `tzset` leaves no sign of some.
 - **Single records** cost a rewrite of the file, because that is the format; a store with a log does less.
+  Setting the umask each time, as each save does, is the last hundredth.
 """
 
 
