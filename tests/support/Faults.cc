@@ -399,6 +399,9 @@ void* operator new[](std::size_t n) {
 void* operator new(std::size_t n, const std::nothrow_t&) noexcept {
     return fails(Call::allocation) ? nullptr : std::malloc(std::max<std::size_t>(n, 1));
 }
+void* operator new[](std::size_t n, const std::nothrow_t& nothrow) noexcept {
+    return fails(Call::new_array) ? nullptr : operator new(n, nothrow);
+}
 void operator delete(void* p) noexcept {
     std::free(p);
 }
@@ -406,6 +409,9 @@ void operator delete(void* p, const std::nothrow_t&) noexcept {
     std::free(p);
 }
 void operator delete[](void* p) noexcept {
+    std::free(p);
+}
+void operator delete[](void* p, const std::nothrow_t&) noexcept {
     std::free(p);
 }
 void operator delete(void* p, std::size_t) noexcept {
