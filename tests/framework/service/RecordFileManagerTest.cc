@@ -546,6 +546,21 @@ TEST_F(RecordFileManagerTest, StepsRefuseANullStream) {
     EXPECT_EQ(_out, "ok");
 }
 
+TEST_F(RecordFileManagerTest, WriteRecordWritesOneAndTellsWhetherItCould) {
+    EXPECT_EQ(run([this] {
+                  std::FILE* const file = fopen(_file.c_str(), "wb");
+                  if (store().writeRecord(file, "key", 5, "value")) fputs("done", stdout);
+                  fclose(file);
+                  std::FILE* const full = fopen("/dev/full", "wb");
+                  setvbuf(full, nullptr, _IONBF, 0);
+                  if (!store().writeRecord(full, "key", 5, "value")) fputs(" refused", stdout);
+                  fclose(full);
+              }),
+              "");
+    EXPECT_EQ(_out, "done refused");
+    EXPECT_EQ(readFile(_file), record("key", "value"));
+}
+
 TEST_F(RecordFileManagerTest, ReadLoopedReadsNothingForZero) {
     writeFile(_file, "abc");
     run([this] {

@@ -6,7 +6,9 @@
 #include <csignal>
 #include <cstdio>
 #include <functional>
+#include <map>
 #include <string>
+#include <vector>
 
 #include "support/Child.h"
 #include "support/TempDir.h"
@@ -63,6 +65,37 @@ class ConfigurationTest : public testing::Test {
     const std::string _conf;
     bool _success = false;
 };
+
+TEST_F(ConfigurationTest, EachMethodPassesItsOwnMinimumAndThoseBelow) {
+    const std::vector<std::string> minima{"DEBUG", "INFO",  "NOTICE", "WARN", "ERROR",
+                                          "CRIT",  "ALERT", "FATAL",  "EMERG"};
+    const std::map<std::size_t, std::string> methods{{0, "debug"}, {1, "info"}, {3, "warn"},
+                                                     {4, "error"}, {5, "crit"}, {7, "fatal"}};
+    for (std::size_t minimum = 0; minimum < minima.size(); ++minimum) {
+        EXPECT_EQ(run("rootCategory=" + minima[minimum] + ", A1\n" + twoAppenders(),
+                      [] {
+                          Logger logger("x");
+                          logger.debug("%s", "debug");
+                          logger.info("%s", "info");
+                          logger.warn("%s", "warn");
+                          logger.error("%s", "error");
+                          logger.crit("%s", "crit");
+                          logger.fatal("%s", "fatal");
+                          logger.debug(std::string("debug"));
+                          logger.info(std::string("info"));
+                          logger.warn(std::string("warn"));
+                          logger.error(std::string("error"));
+                          logger.crit(std::string("crit"));
+                          logger.fatal(std::string("fatal"));
+                      }),
+                  "");
+        std::string expected;
+        for (auto it = methods.lower_bound(minimum); it != methods.end(); ++it)
+            expected += it->second + "\n";
+        EXPECT_EQ(log(), expected + expected) << minima[minimum];
+        std::remove(_dir.file("a.log").c_str());
+    }
+}
 
 TEST_F(ConfigurationTest, AMissingFileLeavesTheDefaults) {
     const ChildResult result = runInChild([&] {
