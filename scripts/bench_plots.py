@@ -11,7 +11,7 @@ PEERS = ("#3b6fb6", "#5aa469", "#c98a2b", "#7d5ba6", "#4aa6a6", "#a0756b")
 
 def colour_of(names):
     """A colour for every name."""
-    peers = [name for name in names if name not in COLOURS]
+    peers = sorted(name for name in names if name not in COLOURS)
     return {**COLOURS, **{name: PEERS[i % len(PEERS)] for i, name in enumerate(peers)}}
 
 
@@ -48,7 +48,7 @@ def bars(title, groups, unit, x, y, width, height):
     for g, (label, by) in enumerate(groups):
         bar = min(34, (step - 14) / len(by))
         for i, (name, value) in enumerate(by.items()):
-            tall = height * min(value, top) / top
+            tall = 0.93 * height * min(value, top) / top  # the title stands above
             left = x + g * step + i * bar
             parts.append(f'<rect x="{left:.1f}" y="{y + height - tall:.1f}" width="{bar - 2:.1f}" '
                          f'height="{tall:.1f}" fill="{colours[name]}"/>')
