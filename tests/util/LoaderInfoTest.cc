@@ -139,10 +139,11 @@ TEST(LoaderInfoTest, AnUnknownOptionIsToldAndParsingGoesOn) {
     EXPECT_EQ(result.out, "");
 }
 
-TEST(LoaderInfoTest, OtherComplaintsArePassedOver) {
+TEST(LoaderInfoTest, OtherComplaintsArePassedOverAndParsingGoesOn) {
     const ChildResult result = runInChild([] {
-        Parsed info({"-p", "nonsense", "--mode"});
-        return info.isError() || info.getPort() != 8089 ? 1 : 0;
+        Parsed info({"-p", "nonsense", "-n", "worker", "--mode"});
+        const bool wentOn = info.getComponentName() == "worker";
+        return info.isError() || info.getPort() != 8089 || !wentOn ? 1 : 0;
     });
     EXPECT_EQ(result.status, 0);
     EXPECT_EQ(result.err, "");
