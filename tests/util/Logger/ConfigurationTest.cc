@@ -1,6 +1,7 @@
 #include <korvex/util/Logger.h>
 
 #include <gmock/gmock.h>
+#include <unistd.h>
 
 #include <cerrno>
 #include <csignal>
@@ -65,6 +66,22 @@ class ConfigurationTest : public testing::Test {
     const std::string _conf;
     bool _success = false;
 };
+
+TEST_F(ConfigurationTest, TheFileIsClosedBeforeTheLogFilesAreOpened) {
+    // The parse error is logged to the file before initialize() returns.
+    writeFile(_conf, "nonsense\nrootCategory=INFO, A1\n" + twoAppenders());
+    const ChildResult result = runInChild([&] {
+        const int lowest = dup(STDIN_FILENO);
+        close(lowest);
+        Logger::initialize(Pathname(_conf), Pathname(_dir.path()));
+        const std::string link = "/proc/self/fd/" + std::to_string(lowest);
+        char target[4096] = "";
+        return readlink(link.c_str(), target, sizeof target - 1) > 0 && target == _dir.file("a.log")
+                   ? 0
+                   : 1;
+    });
+    EXPECT_EQ(result.status, 0);
+}
 
 TEST_F(ConfigurationTest, EachMethodPassesItsOwnMinimumAndThoseBelow) {
     const std::vector<std::string> minima{"DEBUG", "INFO",  "NOTICE", "WARN", "ERROR",
