@@ -510,6 +510,8 @@ TEST_F(FileSystemTest, ReadlinkIsTrueOnlyForAnEmptyResult) {
     char buf[] = "................";
     EXPECT_FALSE(path("link").readlink(buf, sizeof buf));
     EXPECT_EQ(std::string(buf, 8), "target..") << "the link was read, without a NUL";
+    EXPECT_TRUE(Pathname("t").symlinkTo(path("short")));
+    EXPECT_FALSE(path("short").readlink(buf, sizeof buf)) << "one byte is not an empty result";
     EXPECT_FALSE(path("missing").readlink(buf, sizeof buf));
 }
 

@@ -6,8 +6,10 @@
 #include <atomic>
 #include <cerrno>
 #include <csignal>
+#include <cstring>
 #include <functional>
 #include <memory>
+#include <new>
 #include <string>
 #include <thread>
 #include <vector>
@@ -454,6 +456,29 @@ TEST(InThreadActorQueueTest, ASubmitterMayWait) {
         ASSERT_EQ(notes.size(), static_cast<std::size_t>(i) + 1);
     }
     owner.join();
+}
+
+TEST(InThreadActorQueueTest, AnActorThatWasWaitedForOnceMayDestroyItselfLater) {
+    constexpr unsigned char kDead = 0x5A;
+    struct Leaving : InThreadActor {
+        void callback() override {
+            if (!leaves) return;
+            this->~Leaving();
+            std::memset(static_cast<void*>(this), kDead, sizeof *this);
+        }
+        bool leaves = false;
+    };
+    alignas(Leaving) unsigned char place[sizeof(Leaving)];
+    auto* const actor = new (place) Leaving;
+    InThreadActorQueue queue;
+    std::thread submitter([&] { queue.submitAndWait(*actor); });
+    while (queue.runQueued() == 0)
+        queue.waitForWork(60);
+    submitter.join();
+    actor->leaves = true;
+    queue.submit(*actor);
+    EXPECT_EQ(queue.runQueued(), 1U);
+    EXPECT_THAT(place, testing::Each(kDead));
 }
 
 TEST(InThreadActorQueueTest, AThrowingCallbackComesThroughAndTheRestStays) {

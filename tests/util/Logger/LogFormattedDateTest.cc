@@ -161,6 +161,16 @@ TEST_F(LogFormattedDateTest, NumbersComeOutAsStrftimeWritesThem) {
     }
 }
 
+TEST_F(LogFormattedDateTest, YearsAloneHaveRoomForAllTheirDigits) {
+    std::string years;
+    std::string expected;
+    for (int n = 1; n < 40; ++n) {  // with and without strftime
+        years += "%Y";
+        expected += "2007";
+        EXPECT_EQ(date(years.c_str()), expected);
+    }
+}
+
 TEST_F(LogFormattedDateTest, NumbersTakeNoStrftime) {
     const CountCalls calls(Call::strftime);
     EXPECT_EQ(date("%d.%m.%Y %H:%M:%S,%l"), "05.03.2007 14:03:09,007");
