@@ -429,11 +429,13 @@ TEST_F(LogAppenderTest, AConfirmedIdentityIsNotCheckedForFiveMoreSeconds) {
     EXPECT_EQ(stats.count(), 0U);
     log("three", 1006);
     EXPECT_EQ(stats.count(), 1U);
+    log("in the same second", 1006);
+    EXPECT_EQ(stats.count(), 1U);
     log("four", 1011);
     EXPECT_EQ(stats.count(), 1U);
     log("five", 1012);
     EXPECT_EQ(stats.count(), 2U);
-    EXPECT_EQ(content(), "one\ntwo\nthree\nfour\nfive\n");
+    EXPECT_EQ(content(), "one\ntwo\nthree\nin the same second\nfour\nfive\n");
 }
 
 TEST_F(LogAppenderTest, TheEndOfTimeDoesNotOverflowTheCheck) {
