@@ -162,6 +162,14 @@ TEST(LoaderInfoTest, InitMayBeCalledAgain) {
     EXPECT_EQ(result.status, 0);
 }
 
+TEST(LoaderInfoTest, InitSetsTheSwitchesBack) {
+    Parsed info({"--debug", "--nodaemon"});
+    EXPECT_TRUE(!info.getDebug() && !info.getDaemon() && info.getUseDebugLog());
+    const char* const argv[] = {"program", nullptr};
+    info.init(1, argv);
+    EXPECT_TRUE(info.getDebug() && info.getDaemon() && !info.getUseDebugLog());
+}
+
 TEST(LoaderInfoTest, HelpEndsTheProcessAndHidesNoseg) {
     const ChildResult result = runInChild([] {
         Parsed info({"--help"});

@@ -75,7 +75,6 @@ Pathname Pathname::toParent() const {
 }
 
 std::string Pathname::ext() const {
-    if (empty() || back() == kSep || back() == '.') return {};
     const std::size_t mark = find_last_of("/.");
     return mark == npos || (*this)[mark] == kSep ? std::string() : substr(mark + 1);
 }
