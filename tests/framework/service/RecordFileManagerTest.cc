@@ -354,6 +354,8 @@ TEST_F(RecordFileManagerTest, AShortChunkIsReportedEachTime) {
     EXPECT_EQ(load(cut(2500, 2400)), kShort) << "in the last chunk";
     EXPECT_EQ(load(cut(2500, 2000)), kShort) << "nothing in the last chunk";
     EXPECT_EQ(load(cut(2500, 1500)), kShort + kShort) << "in a middle chunk, then nothing";
+    EXPECT_EQ(load(cut(3500, 1000)), kShort) << "where nothing comes, nothing more is tried";
+    EXPECT_EQ(load(cut(3500, 1500)), kShort + kShort);
     EXPECT_EQ(load(cut(1000, 999)), kShort);
     EXPECT_EQ(load(cut(1000, 1000)), "");
     EXPECT_EQ(load(cut(1001, 1000)), kShort);

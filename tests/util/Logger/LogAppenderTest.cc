@@ -294,6 +294,17 @@ TEST_F(LogAppenderTest, AFailingFstatDropsTheMessageAndClosesTheFile) {
     EXPECT_EQ(content(), "kept\n");
 }
 
+TEST_F(LogAppenderTest, AnEmptyLineIsNoFailedWrite) {
+    EXPECT_EQ(errOf([&] {
+                  set("fileName", _file);
+                  set("layout.ConversionPattern", "%m");
+                  log("");
+                  log("text");
+              }),
+              "");
+    EXPECT_EQ(content(), "text");
+}
+
 TEST_F(LogAppenderTest, AFailingWriteLosesTheMessageAndOpensAgain) {
     EXPECT_EQ(errOf([&] {
                   set("fileName", _file);
