@@ -74,9 +74,8 @@ void startRow(unsigned n) {
 
 template <class C>
 int loggingMain(int argc, char** argv) {
-    if (argc != 3) giveUp("usage: contestant ROW N");
-    const Row row(argv[1]);
-    const auto n = static_cast<unsigned>(std::strtoul(argv[2], nullptr, 10));
+    const Row row(argc, argv);
+    const unsigned n = row.n;
     if (row.name == "start") {
         startRow<C>(n);
         return 0;

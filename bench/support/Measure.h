@@ -108,9 +108,14 @@ inline double peakMiB() {
     return static_cast<double>(kib) / 1024;
 }
 
-// "load-1000": the text before the last '-', and the number after it (0 when there is none).
+// What a contestant is called with: a row, "load-1000", which is a name and behind the last '-' a
+// number (0 when there is none), and how many calls or child processes to make.
 struct Row {
-    explicit Row(const std::string& row) : name(row) {
+    Row(int argc, char** argv) {
+        if (argc != 3) giveUp("usage: contestant ROW N");
+        name = argv[1];
+        n = static_cast<unsigned>(std::strtoul(argv[2], nullptr, 10));
+        const std::string row = name;
         const std::size_t dash = row.rfind('-');
         if (dash == std::string::npos || row.find_first_not_of("0123456789", dash + 1) < row.size())
             return;
@@ -119,6 +124,7 @@ struct Row {
     }
     std::string name;
     unsigned number = 0;
+    unsigned n = 0;
 };
 
 }  // namespace bench

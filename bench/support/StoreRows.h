@@ -136,9 +136,8 @@ double saves(unsigned n, const Map& all) {
 
 template <class C>
 int storeMain(int argc, char** argv) {
-    if (argc != 3) giveUp("usage: contestant ROW N");
-    const Row row(argv[1]);
-    const auto n = static_cast<unsigned>(std::strtoul(argv[2], nullptr, 10));
+    const Row row(argc, argv);
+    const unsigned n = row.n;
     if (row.name == "save") {
         report("ns", saves<C>(n, records(row.number)) / row.number);
         return 0;

@@ -88,11 +88,23 @@ std::vector<const LogAppender*> Configuration::destinations(const LogChannel& ch
     return {channel.appenders().begin(), channel.appenders().end()};
 }
 
+bool Configuration::writesTo(const LogChannel& channel, const LogAppender& appender) {
+    const auto all = destinations(channel);
+    return std::count(all.begin(), all.end(), &appender) > 0;
+}
+
+std::vector<const Appender*> Configuration::everyAppender() const {
+    std::vector<const Appender*> all;
+    for (const Appender& appender : appenders)
+        all.push_back(&appender);
+    all.push_back(&rootAppender);
+    return all;
+}
+
 std::vector<std::string> Configuration::users(const LogAppender& appender) const {
     std::vector<std::string> names;
     const auto look = [&](const Channel& channel, const std::string& name) {
-        const auto all = destinations(*channel.made);
-        if (std::count(all.begin(), all.end(), &appender) > 0) names.push_back(name);
+        if (writesTo(*channel.made, appender)) names.push_back(name);
     };
     look(root, "the root");
     for (const Channel& category : categories)

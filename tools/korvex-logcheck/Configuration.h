@@ -33,6 +33,9 @@ struct Configuration {
     const Appender* appenderOf(const LogAppender* made) const;
     // Where the channel's messages go, in order: never empty.
     static std::vector<const LogAppender*> destinations(const LogChannel& channel);
+    static bool writesTo(const LogChannel& channel, const LogAppender& appender);
+    // The appenders, and the root appender last.
+    std::vector<const Appender*> everyAppender() const;
     // The names of the channels that write to it.
     std::vector<std::string> users(const LogAppender& appender) const;
     // "MAIN", or "rootAppender".

@@ -40,10 +40,8 @@ std::string explain(const Configuration& config, const DeferedLogConf& error) {
             if (said.lineno == error.lineno) return explainWords(said.value);
         }
     }
-    std::vector<Appender> all = config.appenders;
-    all.push_back(config.rootAppender);
-    for (const Appender& appender : all) {
-        for (const ConfigStatement& said : appender.attributes) {
+    for (const Appender* const appender : config.everyAppender()) {
+        for (const ConfigStatement& said : appender->attributes) {
             if (said.lineno == error.lineno) return explainAttribute(said);
         }
     }

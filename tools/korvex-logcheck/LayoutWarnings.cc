@@ -50,10 +50,8 @@ void checkSample(const Configuration& config, const Appender& appender, Findings
 }  // namespace
 
 void findInLayouts(const Configuration& config, Findings& to) {
-    std::vector<Appender> all = config.appenders;
-    all.push_back(config.rootAppender);
-    for (const Appender& appender : all) {
-        checkChoice(appender, to);
-        checkSample(config, appender, to);
+    for (const Appender* const appender : config.everyAppender()) {
+        checkChoice(*appender, to);
+        checkSample(config, *appender, to);
     }
 }

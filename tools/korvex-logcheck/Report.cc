@@ -71,8 +71,7 @@ void rowsOfSample(const Sample& sample) {
 // The first category that writes there lends its name to the sample; else the root does.
 Sample sampleOf(const Configuration& config, const LogAppender& appender) {
     for (const Channel& category : config.categories) {
-        const auto all = Configuration::destinations(*category.made);
-        if (std::count(all.begin(), all.end(), &appender) > 0) {
+        if (Configuration::writesTo(*category.made, appender)) {
             return sampleLine(appender, category.name, *category.made);
         }
     }

@@ -1,5 +1,7 @@
 #include "support/CommandLine.h"
 
+#include <korvex/Version.h>
+
 #include <cstdio>
 #include <cstdlib>
 
@@ -32,7 +34,7 @@ void CommandLine::showHelp() const {
 }
 
 void CommandLine::showVersion() const {
-    std::printf("%s %s\n", _name, KORVEX_VERSION);
+    std::printf("%s %s\n", _name, KORVEX_VERSION_STRING);
     finishOutput();
     std::exit(EXIT_SUCCESS);
 }
