@@ -11,7 +11,7 @@
 #include <memory>
 #include <string>
 
-inline namespace KORVEX_EXPORT korvex {
+KORVEX_NAMESPACE(korvex) {
 
 // How the process was started: its directories (from the environment), its options (from the
 // command line, by popt), its id and start time. Everybody asks the one instance; the main thread
@@ -115,4 +115,4 @@ class LoaderInfo {
     bool _optionsError = false;
 };
 
-}  // namespace korvex
+}  // KORVEX_NAMESPACE(korvex)

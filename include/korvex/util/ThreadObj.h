@@ -8,7 +8,7 @@
 #include <cstdint>
 #include <stdexcept>
 
-inline namespace KORVEX_EXPORT korvex {
+KORVEX_NAMESPACE(korvex) {
 
 // What a failed thread-library call becomes: what() names the thread, the call and the error.
 class PthreadException : public std::runtime_error {
@@ -212,4 +212,4 @@ class ThreadSpecificPointer {
     TSP_Implementor _impl;
 };
 
-}  // namespace korvex
+}  // KORVEX_NAMESPACE(korvex)

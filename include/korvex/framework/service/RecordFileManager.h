@@ -13,7 +13,7 @@
 #include <utility>
 #include <vector>
 
-inline namespace KORVEX_EXPORT korvex {
+KORVEX_NAMESPACE(korvex) {
 
 // One value on its way into or out of the store. Owns nothing: see RecordFileManager::get.
 struct PersistentHashData {
@@ -121,4 +121,4 @@ class RecordFileManager {
     std::map<std::string, std::pair<std::uint32_t, void*>> records;  // blocks by malloc
 };
 
-}  // namespace korvex
+}  // KORVEX_NAMESPACE(korvex)

@@ -13,7 +13,7 @@
 #include <string>
 #include <vector>
 
-inline namespace KORVEX_EXPORT korvex {
+KORVEX_NAMESPACE(korvex) {
 
 class LogFormat;
 class LogMsgMetadata;
@@ -110,4 +110,4 @@ class LogAppender {
     std::atomic<bool> _writing{false};
 };
 
-}  // namespace korvex
+}  // KORVEX_NAMESPACE(korvex)

@@ -8,7 +8,7 @@
 #include <string>
 #include <vector>
 
-inline namespace KORVEX_EXPORT korvex {
+KORVEX_NAMESPACE(korvex) {
 
 class CachedTm;
 class LogAppender;
@@ -96,4 +96,4 @@ class LogFormat {
     std::list<LogFormattedDate> _dates;
 };
 
-}  // namespace korvex
+}  // KORVEX_NAMESPACE(korvex)
