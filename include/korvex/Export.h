@@ -1,8 +1,13 @@
 #pragma once
 
 // Stands before a free function of a public header, as clang++ looks at the namespace around the
-// function's definition.
+// function's definition. The static library, whose users compile with KORVEX_STATIC, shows nothing:
+// a plugin that it is linked into does not show Korvex either.
+#ifdef KORVEX_STATIC
+#define KORVEX_EXPORT
+#else
 #define KORVEX_EXPORT [[gnu::visibility("default")]]
+#endif
 
 // Stands before the name of a class that a public header declares but does not define: nobody else
 // links to it. The library is compiled so that whatever no public header declares is hidden anyway.
