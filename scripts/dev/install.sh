@@ -1,4 +1,4 @@
-# shellcheck shell=sh
+# shellcheck shell=sh disable=SC2154  # dev's own variables
 # ./dev install; sourced by dev.
 
 # Sets prefix and shared from the word's arguments.
@@ -33,8 +33,9 @@ install_korvex() {
     install_arguments "$@"
     root=
     if ! may_write "$prefix"; then
-        [ "$(id -u)" -ne 0 ] && command -v sudo > /dev/null ||
+        if [ "$(id -u)" -eq 0 ] || ! command -v sudo > /dev/null; then
             stop "cannot write below $prefix; become root, or choose a folder of yours by --prefix"
+        fi
         root=as_root
     fi
     need_build

@@ -1,4 +1,4 @@
-# shellcheck shell=sh
+# shellcheck shell=sh disable=SC2154  # dev's own variables
 # What ./dev needs installed; sourced by it. Debian's names of packages, which are Ubuntu's too.
 
 # there PACKAGE: whether it is installed, by Debian's word or because what it holds is found.
@@ -23,10 +23,10 @@ as_root() {
 apt() {
     apt_try=0
     while ! as_root env DEBIAN_FRONTEND=noninteractive apt-get "$@" < /dev/null > "$log.apt" 2>&1; do
-        grep -qE 'Could not get lock|Unable to (acquire|lock)' "$log.apt" && [ $apt_try -lt 120 ] || {
+        if [ $apt_try -eq 120 ] || ! grep -qE 'Could not get lock|Unable to (acquire|lock)' "$log.apt"; then
             cat "$log.apt" >> "$log"
             return 1
-        }
+        fi
         [ $apt_try -gt 0 ] || say "another apt is at work; waiting for it to end"
         apt_try=$((apt_try + 1))
         sleep 5

@@ -1,4 +1,4 @@
-# shellcheck shell=sh
+# shellcheck shell=sh disable=SC2154  # dev's own variables
 # How ./dev runs what takes long; sourced by it. What is run writes to the log; the terminal shows what
 # goes on, and everybody sees what went wrong.
 
