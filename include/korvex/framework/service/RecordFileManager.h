@@ -41,12 +41,15 @@ struct PersistentFullData {
 //
 // A child of fork(2) may use the store, of which it has its own copy, whatever put() calls were
 // under way in the parent's other threads; its file is the parent's still, so it should name its
-// own.
+// own. Other calls that were under way in other threads may have left the copy half changed: such
+// a child must not use the store. Whatever was under way, it may exit(3): the parent's save is
+// not disturbed.
 //
-// What it does not promise: a save rewrites the file in place, without fsync(2), so a crash or a
-// full disk in its middle leaves the file cut after its last complete write (memory is never
-// touched by a failed save). A value that put() replaces is never freed. A key is NUL-terminated
-// when it is loaded: one with an embedded NUL comes back shortened. Keys that begin with
+// What it does not promise: a save rewrites the file in place, without fsync(2), so a crash, an
+// exit(3) in another thread or a full disk in its middle leaves the file cut: a beginning of what
+// was to be saved, and nothing else (memory is never touched by a failed save). A value that put()
+// replaces is never freed. A key is NUL-terminated when it is loaded: one with an embedded NUL
+// comes back shortened. Keys that begin with
 // "_record-file-version" in any case are taken for the file's version and do not come back at all.
 class RecordFileManager {
   public:
@@ -93,9 +96,9 @@ class RecordFileManager {
     // and leaves this store's file and version alone.
     void preload(const std::string& prefix, const Pathname& file);
     // Rewrites the record file: the version record, then all records in key order. Failures to
-    // open, write or close it are logged. The process's umask is 066 afterwards, and stays so:
-    // later files, log files among them, become 0600. Throws ComponentException when no file is
-    // named, and std::bad_alloc when memory runs out, the file then being cut as by a failed write.
+    // open, write or close it are logged; after a failed write the file is a beginning of what was
+    // to be saved. The process's umask is 066 afterwards, and stays so: later files, log files
+    // among them, become 0600. Throws ComponentException when no file is named.
     void saveToFile();
 
     // Steps of the above, for tests and tools.
