@@ -7,7 +7,6 @@
 #include "framework/service/RecordFileManager/ValueBlock.h"
 
 #include <string.h>
-#include <strings.h>
 
 #include <algorithm>
 #include <cstring>
@@ -30,11 +29,6 @@ Block allocate(std::uint32_t size, std::size_t extra, const char* purpose) {
 }
 
 }  // namespace
-
-bool isVersionKey(std::string_view key) {
-    return key.size() >= VERSION_KEY.size() &&
-           strncasecmp(key.data(), VERSION_KEY.data(), VERSION_KEY.size()) == 0;
-}
 
 // Reads one record file, record by record.
 class KORVEX_HIDDEN RecordFileManager::Loader {

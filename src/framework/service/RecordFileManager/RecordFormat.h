@@ -27,7 +27,18 @@ inline std::uint32_t getLength(const unsigned char (&in)[kLengthBytes]) {
     return n;
 }
 
-// Whether a key that is read back is taken for the version: by its beginning, in any case.
-bool isVersionKey(std::string_view key);
+constexpr char asciiLower(char c) {
+    return c >= 'A' && c <= 'Z' ? static_cast<char>(c - 'A' + 'a') : c;
+}
+
+// Whether a key that is read back is taken for the version: by its beginning, in upper or lower
+// case. Not by strncasecmp(3), for which I and i are no pair in some locales.
+constexpr bool isVersionKey(std::string_view key) {
+    if (key.size() < VERSION_KEY.size()) return false;
+    for (std::size_t i = 0; i < VERSION_KEY.size(); ++i) {
+        if (asciiLower(key[i]) != VERSION_KEY[i]) return false;
+    }
+    return true;
+}
 
 }  // namespace korvex
