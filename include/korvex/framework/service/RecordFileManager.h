@@ -8,9 +8,8 @@
 
 #include <cstdint>
 #include <cstdio>
-#include <map>
+#include <memory>
 #include <string>
-#include <utility>
 #include <vector>
 
 inline namespace KORVEX_EXPORT korvex {
@@ -69,7 +68,8 @@ class RecordFileManager {
     // Stores a copy of the value under the key, replacing the one it had, and saves everything if
     // writeToFile is true. The key "_record-file-version" is refused with a logged error. Throws
     // ComponentException "Unable to allocate memory for storing hash value.", the store being as
-    // it was, and what saveToFile() throws, the value being stored.
+    // it was (a key of 4 GiB is refused so too), and what saveToFile() throws, the value being
+    // stored.
     void put(const std::string& key, const PersistentHashData& data, bool writeToFile)
         KORVEX_EXCLUDES(_mutex);
     // Hands out a copy of the value, which the caller frees with delete[] static_cast<char*>(p);
@@ -110,21 +110,18 @@ class RecordFileManager {
     bool writeRecord(std::FILE* outFile, std::string key, unsigned int dataLen, const void* data);
 
   private:
-    class Loader;
+    struct State;
 
-    RecordFileManager() = default;
+    RecordFileManager();
 
     static void keepLockThroughForks();
 
     void load(const Pathname& file, const std::string& prefix, std::string& version);
-    void insert(std::string key, std::uint32_t size, void* block);
 
     static RecordFileManager* __pInstance;
 
-    Pathname dbHomePath;                                             // empty until set
-    std::string fileVersion;                                         // as read from the file
-    Mutex _mutex;                                                    // serialises put()
-    std::map<std::string, std::pair<std::uint32_t, void*>> records;  // blocks by malloc
+    Mutex _mutex;  // serialises put()
+    const std::unique_ptr<State> _state;
 };
 
 }  // namespace korvex

@@ -20,11 +20,11 @@ inline void putLength(unsigned char (&out)[kLengthBytes], std::uint32_t n) {
         out[i] = static_cast<unsigned char>(n >> (8 * i));
 }
 
-inline std::uint32_t getLength(const unsigned char (&in)[kLengthBytes]) {
-    std::uint32_t n = 0;
-    for (std::size_t i = 0; i < kLengthBytes; ++i)
-        n |= static_cast<std::uint32_t>(in[i]) << (8 * i);
-    return n;
+// Of the four bytes there.
+inline std::uint32_t getLength(const void* in) {
+    const auto* const byte = static_cast<const unsigned char*>(in);
+    return std::uint32_t{byte[0]} | std::uint32_t{byte[1]} << 8 | std::uint32_t{byte[2]} << 16 |
+           std::uint32_t{byte[3]} << 24;
 }
 
 constexpr char asciiLower(char c) {

@@ -3,12 +3,12 @@
 
 #include "framework/service/RecordFileManager/RecordFormat.h"
 #include "framework/service/RecordFileManager/StagedFile.h"
+#include "framework/service/RecordFileManager/State.h"
 #include "framework/service/RecordFileManager/StoreLogger.h"
 
 #include <sys/stat.h>
 
 #include <cerrno>
-#include <cstring>
 #include <limits>
 
 inline namespace korvex {
@@ -28,6 +28,28 @@ bool writeFields(std::string_view key, std::uint32_t size, const void* data, Wri
     putLength(valueLength, size);
     return write(keyLength, kLengthBytes) && write(key.data(), key.size()) &&
            write(valueLength, kLengthBytes) && write(data, size);
+}
+
+bool writeVersion(StagedFile& file) {
+    return writeFields(VERSION_KEY, VERSION_STR.size(), VERSION_STR.data(),
+                       [&file](const void* p, std::size_t n) { return file.write(p, n); });
+}
+
+// Those that lie together are written together.
+bool writeRecords(StagedFile& file, const RecordTable& table) {
+    const char* begin = nullptr;
+    const char* end = nullptr;
+    const auto write = [&] { return file.write(begin, static_cast<std::size_t>(end - begin)); };
+    bool written = true;
+    table.walk("", [&](RecordView record) {
+        if (record.begin() != end) {
+            written = write();
+            begin = record.begin();
+        }
+        end = record.begin() + record.size();
+        return written;
+    });
+    return written && write();
 }
 
 void reportFailedWrite() {
@@ -52,24 +74,21 @@ bool RecordFileManager::writeRecord(std::FILE* outFile, std::string key, unsigne
 
 void RecordFileManager::saveToFile() {
     storeLogger().debug("Writing record file to disk.");
-    if (dbHomePath.empty()) {
+    if (_state->file.empty()) {
         throw ComponentException(storeLogger(), "Tried to write to db without setting filename.");
     }
     umask(066);  // the records are nobody else's business; never set back
-    StagedFile file(dbHomePath);
+    StagedFile file(_state->file);
     if (!file) {
         __extension__ storeLogger().error(
             "Unable to open record file for writing at '%s'.  Cannot save hash data.  Error is "
             "%d: %m.",
-            dbHomePath.c_str(), errno);
+            _state->file.c_str(), errno);
         return;
     }
-    const auto stage = [&file](const void* p, std::size_t n) { return file.write(p, n); };
-    bool written = writeFields(VERSION_KEY, VERSION_STR.size(), VERSION_STR.data(), stage);
-    for (auto it = records.begin(); written && it != records.end(); ++it)
-        written = writeFields(it->first, it->second.first, it->second.second, stage);
     // A full disk shows at the closing at the latest.
-    if (!written || !file.close()) reportFailedWrite();
+    if (!writeVersion(file) || !writeRecords(file, _state->records.table()) || !file.close())
+        reportFailedWrite();
 }
 
 }  // namespace korvex

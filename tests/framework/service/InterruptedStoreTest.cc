@@ -18,8 +18,8 @@
 #include "support/Sweep.h"
 #include "support/TempDir.h"
 
-// exit(3) and fork(2) while another thread saves. Both hand on what a stdio stream has in its
-// buffer, whoever is using it.
+// exit(3) and fork(2) while another thread saves or loads. Both hand on what a stdio stream has in
+// its buffer, whoever is using it.
 
 namespace {
 
@@ -143,5 +143,40 @@ TEST_P(InterruptedSave, AChildThatIsForkedInItsMidstAndExitsLeavesItAlone) {
 
 INSTANTIATE_TEST_SUITE_P(EachWay, InterruptedSave, testing::ValuesIn(savings()),
                          [](const auto& param) { return std::string(param.param.name); });
+
+// The child's exit moves the offset of a stream that was read ahead back to where the reader is.
+TEST(InterruptedLoad, AChildThatIsForkedInItsMidstAndExitsLeavesItAlone) {
+    const TempDir dir;
+    const std::string file = dir.file("data");
+    testsupport::writeFile(file, fileOf('a'));
+    const ChildResult result = runInChild(
+        [&]() -> int {
+            store().setDBFile(Pathname(file));
+            for (unsigned round = 0; round < 150 * testScale(); ++round) {
+                hold('b');
+                std::atomic<bool> begun{false};
+                std::thread loader([&] {
+                    begun = true;
+                    store().readFile();
+                });
+                while (!begun)
+                    std::this_thread::yield();
+                pause(13 * round % 400);
+                const pid_t child = fork();
+                if (child == 0) std::exit(0);
+                int status = 0;
+                waitpid(child, &status, 0);
+                loader.join();
+                if (status != 0) return 2;
+                for (unsigned i = 0; i < kRecords; ++i) {
+                    if (get(keyOf(i)) != valueOf(i, 'a')) return 1;
+                }
+            }
+            return 0;
+        },
+        60 * testScale());
+    EXPECT_EQ(result.status, 0) << result.signal << result.out << result.err;
+    EXPECT_EQ(result.err, "");
+}
 
 }  // namespace
