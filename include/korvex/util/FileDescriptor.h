@@ -10,7 +10,7 @@
 #include <cstdarg>
 #include <string>
 
-inline namespace KORVEX_EXPORT korvex {
+KORVEX_NAMESPACE(korvex) {
 
 // A POSIX descriptor number, or -1 for none. A plain value: copies mean the same open file, and
 // nothing closes it by itself. Members neither throw nor log; failure is told by the result, with
@@ -143,4 +143,4 @@ class DirectoryDescriptor {
     DIR* _dir = nullptr;
 };
 
-}  // namespace korvex
+}  // KORVEX_NAMESPACE(korvex)

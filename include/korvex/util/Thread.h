@@ -6,7 +6,7 @@
 #include <cstddef>
 #include <memory>
 
-inline namespace KORVEX_EXPORT korvex {
+KORVEX_NAMESPACE(korvex) {
 
 // A piece of work that is handed to another thread to run, through an InThreadActorQueue.
 class InThreadActor {
@@ -161,4 +161,4 @@ class Thread : public PthreadObject {
     JoinHelper _jhelp;
 };
 
-}  // namespace korvex
+}  // KORVEX_NAMESPACE(korvex)

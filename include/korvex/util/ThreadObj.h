@@ -8,7 +8,7 @@
 #include <cstdint>
 #include <stdexcept>
 
-inline namespace KORVEX_EXPORT korvex {
+KORVEX_NAMESPACE(korvex) {
 
 class KORVEX_HIDDEN Deadline;
 
@@ -218,4 +218,4 @@ class ThreadSpecificPointer {
     TSP_Implementor _impl;
 };
 
-}  // namespace korvex
+}  // KORVEX_NAMESPACE(korvex)

@@ -7,7 +7,7 @@
 #include <ctime>
 #include <string>
 
-inline namespace KORVEX_EXPORT korvex {
+KORVEX_NAMESPACE(korvex) {
 
 // A wall-clock instant: seconds and microseconds since the Unix epoch. Seconds keep to the signed
 // 32-bit range whatever the platform's time_t is: additions and the clock saturate at the largest
@@ -93,4 +93,4 @@ class CurrentTimeval : public Timeval {
 KORVEX_EXPORT bool convert_string_to_milliseconds(const char* p, unsigned long long* res,
                                                   unsigned long* charCount);
 
-}  // namespace korvex
+}  // KORVEX_NAMESPACE(korvex)

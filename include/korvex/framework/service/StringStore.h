@@ -8,7 +8,7 @@
 #include <string_view>
 #include <vector>
 
-inline namespace KORVEX_EXPORT korvex {
+KORVEX_NAMESPACE(korvex) {
 
 class RecordFileManager;
 
@@ -62,4 +62,4 @@ class StringStore {
     RecordFileManager* _store;
 };
 
-}  // namespace korvex
+}  // KORVEX_NAMESPACE(korvex)

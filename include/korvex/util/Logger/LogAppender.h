@@ -13,7 +13,7 @@
 #include <string>
 #include <vector>
 
-inline namespace KORVEX_EXPORT korvex {
+KORVEX_NAMESPACE(korvex) {
 
 class LogFormat;
 class LogMsgMetadata;
@@ -116,4 +116,4 @@ class LogAppender {
     bool _registered = false;  // made by find(), so the lock is taken before a fork
 };
 
-}  // namespace korvex
+}  // KORVEX_NAMESPACE(korvex)

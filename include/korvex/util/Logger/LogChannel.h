@@ -7,7 +7,7 @@
 #include <string>
 #include <vector>
 
-inline namespace KORVEX_EXPORT korvex {
+KORVEX_NAMESPACE(korvex) {
 
 class LogAppender;
 class LogMsgMetadata;
@@ -68,4 +68,4 @@ class LogChannel {
     std::vector<LogAppender*> _appenders;  // not owned; empty: the root appender
 };
 
-}  // namespace korvex
+}  // KORVEX_NAMESPACE(korvex)

@@ -8,7 +8,7 @@
 #include <string>
 #include <vector>
 
-inline namespace KORVEX_EXPORT korvex {
+KORVEX_NAMESPACE(korvex) {
 
 class CachedTm;
 class LogAppender;
@@ -103,4 +103,4 @@ class LogFormat {
     std::list<LogFormattedDate> _dates;
 };
 
-}  // namespace korvex
+}  // KORVEX_NAMESPACE(korvex)

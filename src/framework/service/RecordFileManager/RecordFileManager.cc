@@ -6,8 +6,7 @@
 #include "framework/service/RecordFileManager/RecordFormat.h"
 #include "framework/service/RecordFileManager/State.h"
 #include "framework/service/RecordFileManager/StoreLogger.h"
-
-#include <pthread.h>
+#include "platform/AtFork.h"
 
 #include <cstring>
 #include <memory>
@@ -54,21 +53,34 @@ void appendCopy(std::vector<PersistentFullData>& list, RecordView record) {
 
 RecordFileManager::RecordFileManager() : _state(new State) {}
 
+namespace {
+
+// A child of fork(2) would find the store's lock as another thread held it, and nobody to free it.
+// The logging system's locks may be taken under this one, so before a fork this one comes first.
+Mutex* storeLock = nullptr;  // null: there is no store yet
+thread_local bool takenForFork = false;
+
+void takeStoreLock() KORVEX_NO_THREAD_SAFETY_ANALYSIS {
+    takenForFork = storeLock != nullptr && storeLock->NOLOG_lock();
+}
+
+void freeStoreLock() KORVEX_NO_THREAD_SAFETY_ANALYSIS {
+    if (takenForFork) storeLock->NOLOG_unlock();
+    takenForFork = false;
+}
+
+KORVEX_SECOND_AT_START_UP void keepStoreLockThroughForks() {
+    pthread_atfork(&takeStoreLock, &freeStoreLock, &freeStoreLock);
+}
+
+}  // namespace
+
 RecordFileManager* RecordFileManager::instance() {
     if (__pInstance == nullptr) {
         __pInstance = new RecordFileManager;
-        keepLockThroughForks();
+        storeLock = &__pInstance->_mutex;
     }
     return __pInstance;
-}
-
-// A child of fork(2) would find the lock as another thread held it, and nobody to free it. The
-// logging system's locks may be taken under this one, so before a fork this one must come first:
-// what pthread_atfork(3) is told last runs first then.
-void RecordFileManager::keepLockThroughForks() KORVEX_NO_THREAD_SAFETY_ANALYSIS {
-    const auto take = []() KORVEX_NO_THREAD_SAFETY_ANALYSIS { __pInstance->_mutex.NOLOG_lock(); };
-    const auto free = []() KORVEX_NO_THREAD_SAFETY_ANALYSIS { __pInstance->_mutex.NOLOG_unlock(); };
-    static_cast<void>(pthread_atfork(take, free, free));
 }
 
 RecordFileManager::~RecordFileManager() noexcept(false) = default;
