@@ -9,7 +9,7 @@
 #include "base/Stream.h"
 #include "util/Logger/AppenderRegistry.h"
 #include "util/Logger/ChannelRegistry.h"
-#include "util/Logger/NologLock.h"
+#include "util/Logger/LoggingLock.h"
 #include "util/Logger/RootObjects.h"
 
 namespace {
@@ -18,7 +18,7 @@ namespace {
 void forget() {
     {
         ChannelRegistry& registry = ChannelRegistry::instance();
-        const NologLock lock(registry.mutex);
+        const LoggingLock lock(registry.mutex);
         registry.channels.clear();
     }
     rootChannel().setConfig("INFO rootAppender");
