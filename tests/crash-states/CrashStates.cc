@@ -7,7 +7,7 @@
 namespace crashstates {
 
 CrashStates::CrashStates(const History& history, const Bounds& bounds)
-    : _bounds(bounds), _disk(history.before, bounds.blockSize) {
+    : _bounds(bounds), _disk(history.before, bounds.blockSize, bounds.order) {
     collect(0);
     for (std::size_t i = 0; i < history.events.size(); ++i) {
         _disk.apply(history.events[i]);

@@ -25,6 +25,7 @@ struct State {
 struct Bounds {
     std::size_t blockSize = 4096;         // bytes that a disk writes whole or not at all
     std::size_t combinations = 1U << 14;  // of one file's blocks, of the names, of the files
+    NameOrder order = NameOrder::OF_EACH;
 };
 
 // Every state that a power failure after any number of a history's events may leave, each once.
@@ -32,7 +33,8 @@ class CrashStates {
   public:
     explicit CrashStates(const History& history, const Bounds& bounds = {});
 
-    const std::vector<State>& all() const { return _states; }
+    const std::vector<State>& all() const& { return _states; }
+    const std::vector<State>& all() && = delete;  // they point into this
     // False where the bounds left something out.
     bool complete() const { return _complete; }
     // What programs see at the end.

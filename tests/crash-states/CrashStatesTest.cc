@@ -36,8 +36,8 @@ std::string shown(const State& state, std::size_t events) {
     return text + (state.latest == events ? "!" : "");
 }
 
-std::vector<std::string> statesOf(const History& history, std::size_t blockSize = 4) {
-    const CrashStates states(history, {blockSize, 1U << 14});
+std::vector<std::string> statesOf(const History& history, NameOrder order = NameOrder::OF_EACH) {
+    const CrashStates states(history, {4, 1U << 14, order});
     EXPECT_TRUE(states.complete());
     std::vector<std::string> texts;
     for (const State& state : states.all())
@@ -161,6 +161,12 @@ TEST(CrashStates, ChangesOfDifferentNamesArriveInAnyOrder) {
     EXPECT_THAT(statesOf(history), UnorderedElementsAre("!", "a=!", "b=!", "a= b=!"));
 }
 
+TEST(CrashStates, ChangesOfDifferentNamesMayKeepTheirOrder) {
+    const History history{{}, {Create{"a", 1, {}}, Create{"b", 2, {}}, Unlink{"a"}}};
+    EXPECT_THAT(statesOf(history, NameOrder::OF_ALL),
+                UnorderedElementsAre("!", "a=!", "a= b=!", "b=!"));
+}
+
 TEST(CrashStates, ChangesOfOneNameOrOneFileKeepTheirOrder) {
     const History rotation{{{{"l", 1}, {"l.1", 2}}, {{1, {"1", {}}}, {2, {"2", {}}}}},
                            {Unlink{"l.1"}, Rename{"l", "l.1"}, Create{"l", 3, {}}}};
@@ -188,7 +194,7 @@ TEST(CrashStates, WhatProgramsSeeIsNeverLeftOut) {
     std::vector<Event> events{Create{"a", kNew, {}}};
     for (unsigned i = 0; i < 30; ++i)
         events.push_back(Write{kNew, 4 * i, "abcd"});
-    const CrashStates states({{}, events}, {4, 100});
+    const CrashStates states({{}, events}, {4, 100, NameOrder::OF_EACH});
     EXPECT_FALSE(states.complete());
     EXPECT_THAT(states.visible().files.at(kNew).bytes, SizeIs(120));
     const auto isIt = [&](const State& state) {
@@ -202,8 +208,10 @@ TEST(CrashStates, MoreChangesOfNamesThanTheBoundAreNotAllCombined) {
     History history;
     for (unsigned i = 0; i < 5; ++i)
         history.events.push_back(Create{std::string(1, static_cast<char>('a' + i)), i, {}});
-    EXPECT_THAT(CrashStates(history, {4, 32}).all(), SizeIs(32));
-    const CrashStates bounded(history, {4, 31});
+    const CrashStates all(history, {4, 32, NameOrder::OF_EACH});
+    EXPECT_TRUE(all.complete());
+    EXPECT_THAT(all.all(), SizeIs(32));
+    const CrashStates bounded(history, {4, 31, NameOrder::OF_EACH});
     EXPECT_FALSE(bounded.complete());
     std::vector<std::string> texts;
     for (const State& state : bounded.all())

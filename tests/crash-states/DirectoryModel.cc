@@ -19,7 +19,8 @@ void enterAll(const std::map<std::string, std::optional<Inode>>& changed, Names&
 
 }  // namespace
 
-DirectoryModel::DirectoryModel(Names durable) : _durable(std::move(durable)), _visible(_durable) {}
+DirectoryModel::DirectoryModel(Names durable, NameOrder order)
+    : _order(order), _durable(std::move(durable)), _visible(_durable) {}
 
 bool DirectoryModel::Change::touchesWhat(const Change& other) const {
     const auto sameName = [&](const auto& entry) { return other.names.count(entry.first) > 0; };
@@ -61,7 +62,9 @@ void DirectoryModel::sync() {
 
 bool DirectoryModel::mayFollow(const Arrived& arrived, std::size_t change) const {
     for (std::size_t i = 0; i < change; ++i) {
-        if (!arrived[i] && _pending[change].touchesWhat(_pending[i])) return false;
+        const bool isFirst =
+            _order == NameOrder::OF_ALL || _pending[change].touchesWhat(_pending[i]);
+        if (isFirst && !arrived[i]) return false;
     }
     return true;
 }

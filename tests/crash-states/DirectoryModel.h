@@ -10,13 +10,18 @@
 
 namespace crashstates {
 
+// The changes of one directory's names reach the disk ...
+enum class NameOrder {
+    OF_EACH,  // in any order, but those of one name, or of one file, in theirs
+    OF_ALL    // as they were made; file systems with a journal mostly do
+};
+
 // Which names of one directory may be on the disk. A change is there whole or not at all. Until the
-// directory is synced any of the changes may be missing, but of two that touch the same name or the
-// same file the later one only comes after the earlier one.
+// directory is synced any of the changes may be missing.
 class DirectoryModel {
   public:
     // All of `durable` is on the disk.
-    explicit DirectoryModel(Names durable);
+    DirectoryModel(Names durable, NameOrder order);
 
     // Gives the file the name, which another file may have had until now.
     void enter(const std::string& name, Inode inode);
@@ -36,7 +41,7 @@ class DirectoryModel {
         std::map<std::string, std::optional<Inode>> names;  // none: not there any more
         std::set<Inode> inodes;
 
-        bool touchesWhat(const Change& other) const;
+        bool touchesWhat(const Change& other) const;  // a name or a file
     };
     using Arrived = std::vector<bool>;  // for each pending change
 
@@ -46,6 +51,7 @@ class DirectoryModel {
     std::vector<Arrived> someArrived() const;
     Names with(const Arrived& arrived) const;
 
+    const NameOrder _order;
     Names _durable;
     Names _visible;
     std::vector<Change> _pending;

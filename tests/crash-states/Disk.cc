@@ -21,8 +21,8 @@ struct Disk::Applier {
     void operator()(const SyncDirectory&) const { disk._directory.sync(); }
 };
 
-Disk::Disk(const Directory& durable, std::size_t blockSize)
-    : _blockSize(blockSize), _directory(durable.names) {
+Disk::Disk(const Directory& durable, std::size_t blockSize, NameOrder order)
+    : _blockSize(blockSize), _directory(durable.names, order) {
     for (const auto& [inode, file] : durable.files)
         _files.emplace(inode, FileModel(file, blockSize));
 }

@@ -14,7 +14,7 @@ namespace crashstates {
 class Disk {
   public:
     // All of `durable` is on the disk. The block size is in bytes.
-    Disk(const Directory& durable, std::size_t blockSize);
+    Disk(const Directory& durable, std::size_t blockSize, NameOrder order);
 
     void apply(const Event& event);
 

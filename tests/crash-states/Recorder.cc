@@ -18,7 +18,9 @@ namespace crashstates {
 
 namespace {
 
-constexpr std::size_t kBlockSize = 4096;  // any: nobody asks for what may be on the disk
+// Any: nobody asks for what may be on the disk.
+constexpr std::size_t kBlockSize = 4096;
+constexpr NameOrder kOrder = NameOrder::OF_EACH;
 
 std::string procOf(const SystemCall& call) {
     return "/proc/" + std::to_string(call.process);
@@ -61,7 +63,7 @@ class Recorder {
         : _directory(std::move(directory)),
           _directoryId(fileIdOf(_directory)),
           _history{readDirectory(_directory, [this](const FileId& id) { return number(id); }), {}},
-          _disk(_history.before, kBlockSize) {}
+          _disk(_history.before, kBlockSize, kOrder) {}
 
     void onCall(const SystemCall& call) {
         const auto handler = handlers().find(call.number);
