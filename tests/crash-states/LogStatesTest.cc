@@ -8,6 +8,7 @@
 #include <vector>
 
 #include "crash-states/CrashStates.h"
+#include "crash-states/Edits.h"
 #include "crash-states/Effort.h"
 #include "crash-states/RealDirectory.h"
 #include "crash-states/Recorder.h"
@@ -58,6 +59,10 @@ class LogStates : public testing::TestWithParam<Shape> {
   protected:
     void SetUp() override {
         if (testsupport::isEmulated()) GTEST_SKIP() << "the emulator has no ptrace";
+    }
+    History recordLogging() const {
+        testsupport::writeFile(_dir.file("log"), line(0));
+        return record(_dir.path(), [&] { return logLines(1, lineCount() + 1); }).history;
     }
     // In a child.
     int logLines(unsigned from, unsigned end) const {
@@ -131,9 +136,7 @@ std::string brokenPromise(const State& state, const std::vector<std::string>& ge
 }
 
 TEST_P(LogStates, AreWhatWasWrittenWithItsEndOrBlocksOfItMissing) {
-    testsupport::writeFile(_dir.file("log"), line(0));
-    const History history =
-        record(_dir.path(), [&] { return logLines(1, lineCount() + 1); }).history;
+    const History history = recordLogging();
     for (const NameOrder order : {NameOrder::OF_ALL, NameOrder::OF_EACH}) {
         const CrashStates states(history, bounds(order));
         for (const State& state : states.all())
@@ -145,9 +148,7 @@ TEST_P(LogStates, AreWhatWasWrittenWithItsEndOrBlocksOfItMissing) {
 }
 
 TEST_P(LogStates, LetTheNextProgramLogOn) {
-    testsupport::writeFile(_dir.file("log"), line(0));
-    const History history =
-        record(_dir.path(), [&] { return logLines(1, lineCount() + 1); }).history;
+    const History history = recordLogging();
     const CrashStates states(history, bounds(NameOrder::OF_EACH));
     const std::size_t wanted = isThorough() ? 2000 : 40;
     const std::size_t step = std::max<std::size_t>(1, states.all().size() / wanted);
@@ -164,6 +165,32 @@ TEST_P(LogStates, LetTheNextProgramLogOn) {
         ASSERT_EQ(bytesOf(_dir.file(isRotated ? "log.1" : "log")), before + line(7000));
     }
     EXPECT_GE(tried, std::min(wanted, states.all().size()) / 2);
+}
+
+// The rotation in the wrong order, and a byte that was never logged.
+TEST_P(LogStates, ShowWhatIsWrong) {
+    History history = recordLogging();
+    const auto isBroken = [&] {
+        const CrashStates states(history, bounds(NameOrder::OF_ALL));
+        return std::any_of(states.all().begin(), states.all().end(), [&](const State& state) {
+            return !brokenPromise(state, generations(), GetParam().backups, NameOrder::OF_ALL)
+                        .empty();
+        });
+    };
+    if (GetParam().backups > 0) {
+        const History right = history;
+        const auto movesUp = [](const Event& event) {
+            return isA<Rename>(event) && std::get<Rename>(event).from == "log.1";
+        };
+        const auto first = std::find_if(history.events.begin(), history.events.end(), movesUp);
+        ASSERT_TRUE(first != history.events.end());
+        std::iter_swap(first, first + 1);
+        history.events.erase(first + 2, history.events.end());
+        EXPECT_TRUE(isBroken());
+        history = right;
+    }
+    history.events.push_back(Write{1, 0, "M"});
+    EXPECT_TRUE(isBroken());
 }
 
 INSTANTIATE_TEST_SUITE_P(LogStates, LogStates,

@@ -3,6 +3,7 @@
 
 #include <gmock/gmock.h>
 
+#include <algorithm>
 #include <map>
 #include <string>
 
@@ -152,6 +153,18 @@ TEST_F(SaveStates, LeaveNothingToChanceOnceTheProgramSyncs) {
         EXPECT_EQ(state.names.at("data").file->bytes,
                   storesteps::kVersionRecord + storesteps::record("a", "value"));
     }
+}
+
+TEST_F(SaveStates, ShowBytesThatNobodySaved) {
+    _old = storesteps::kVersionRecord;
+    _new = _old + storesteps::record("a", "value");
+    testsupport::writeFile(_data, _old);
+    History history = recordSave("a", "value");
+    history.events.push_back(Write{history.before.names.at("data"), 20, "X"});
+    const CrashStates states(history, _bounds);
+    EXPECT_TRUE(std::any_of(states.all().begin(), states.all().end(), [&](const State& state) {
+        return kindOf(state.names.at("data").file->bytes).empty();
+    }));
 }
 
 }  // namespace
