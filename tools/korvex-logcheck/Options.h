@@ -10,6 +10,8 @@ struct Options {
     Pathname file;
     Pathname home;  // empty: "${KORVEX_HOME}" stays as written
     std::optional<std::string> channel;
+    std::optional<std::string> engine;    // to export to
+    std::optional<std::string> appender;  // the only one to be exported
 };
 
 // Throws Failure. --help and --version end the process.

@@ -11,6 +11,7 @@
 inline namespace KORVEX_EXPORT korvex {
 
 class CachedTm;
+class LayoutPieces;
 class LogAppender;
 class LogFormattedDate;
 class LogMsgMetadata;
@@ -88,6 +89,7 @@ class LogFormat {
     };
     class Compiler;
     class Line;
+    friend class LayoutPieces;  // lays the atoms open, for the tools
 
     Atom* new_atom();
 
