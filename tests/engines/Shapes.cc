@@ -2,6 +2,8 @@
 
 #include <korvex/util/Thread.h>
 
+#include <unistd.h>
+
 #include <functional>
 #include <utility>
 
@@ -65,7 +67,7 @@ Logged loggedMessage(unsigned i) {
     return {level, kChannels[i % kChannels.size()], "", texts[i % texts.size()]};
 }
 
-std::vector<Logged> logAll(LogAppender& appender, unsigned count) {
+std::vector<Logged> logAll(LogAppender& appender, unsigned count, unsigned pause) {
     std::vector<Logged> all;
     const unsigned share = count / static_cast<unsigned>(kThreads.size()) + 1;
     for (unsigned done = 0; done < count;) {
@@ -77,6 +79,7 @@ std::vector<Logged> logAll(LogAppender& appender, unsigned count) {
                 write(appender, one);
                 all.push_back(one);
                 if (done % 100 == 99) writeForged(appender, thread, all);
+                if (done % 2000 == 1999) ::usleep(pause * 1000);
             }
         };
         if (done == 0) {

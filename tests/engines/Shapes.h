@@ -24,8 +24,9 @@ inline const std::vector<std::string> kThreads = {"Main Thread", "worker-1", "re
 
 // Logs `count` messages of all shapes through the appender, and every hundredth besides a message
 // of two lines whose second one looks just like a line of the layout: an engine must take that for
-// a message of its own. The threads log one after another. Returns what was logged, as the engines
+// a message of its own. The threads log one after another, waiting `pause` milliseconds after every
+// 2000 messages. Returns what was logged, as the engines
 // shall see it. The main thread's object must exist.
-std::vector<Logged> logAll(LogAppender& appender, unsigned count);
+std::vector<Logged> logAll(LogAppender& appender, unsigned count, unsigned pause = 0);
 
 }  // namespace testsupport

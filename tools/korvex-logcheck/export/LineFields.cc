@@ -85,7 +85,6 @@ LineField fieldOf(const LayoutPiece& piece) {
         case LayoutPiece::PROCESSOR_TIME:
             return numberField(LineField::CPU_TICKS, piece);
         case LayoutPiece::DATE:
-            return {LineField::TIME, {}, timePartsOf(piece), {}};
         case LayoutPiece::OTHER:
             break;
     }
@@ -115,19 +114,41 @@ void joinDates(std::vector<LineField>& fields) {
     }
 }
 
+// Texts side by side are one.
+void add(std::vector<LineField>& to, const LineField& field) {
+    if (field.kind == LineField::TEXT && field.text.empty()) return;
+    if (field.kind == LineField::TEXT && !to.empty() && to.back().kind == LineField::TEXT) {
+        to.back().text += field.text;
+    } else {
+        to.push_back(field);
+    }
+}
+
+// A date without the texts at its ends, which are texts of the line.
+void addDate(std::vector<LineField>& to, std::vector<TimePart> parts) {
+    std::string behind;
+    if (!parts.empty() && parts.front().letter == 0) {
+        add(to, {LineField::TEXT, parts.front().text, {}, {}});
+        parts.erase(parts.begin());
+    }
+    if (!parts.empty() && parts.back().letter == 0) {
+        behind = parts.back().text;
+        parts.pop_back();
+    }
+    if (!parts.empty()) add(to, {LineField::TIME, {}, parts, {}});
+    add(to, {LineField::TEXT, behind, {}, {}});
+}
+
 }  // namespace
 
 std::vector<LineField> fieldsOf(const std::vector<LayoutPiece>& pieces) {
     std::vector<LineField> fields;
     for (const LayoutPiece& piece : pieces) {
         if (printsNothing(piece)) continue;
-        const LineField field = fieldOf(piece);
-        if (field.kind == LineField::TEXT && field.text.empty()) continue;
-        if (field.kind == LineField::TEXT && !fields.empty() &&
-            fields.back().kind == LineField::TEXT) {
-            fields.back().text += field.text;
+        if (piece.what == LayoutPiece::DATE) {
+            addDate(fields, timePartsOf(piece));
         } else {
-            fields.push_back(field);
+            add(fields, fieldOf(piece));
         }
     }
     joinDates(fields);

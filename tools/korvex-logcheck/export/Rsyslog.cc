@@ -9,13 +9,16 @@ namespace {
 std::string preamble(const std::string& source) {
     return remark("rsyslog", source) +
            "# Messages longer than maxMessageSize are cut. rsyslog's state of reading stands in\n"
-           "# global(workDirectory=...).\n"
+           "# global(workDirectory=...). While it joins lines, rsyslog 8 loses the last message of "
+           "a\n"
+           "# file that is rotated at once; where messages have one line each, take startmsg.regex "
+           "out.\n"
            "global(maxMessageSize=\"256k\")\n"
            "module(load=\"imfile\")\n"
            "module(load=\"mmnormalize\")\n"
            "\n"
            "# Where the JSON goes.\n"
-           "template(name=\"korvex_json\" type=\"string\" string=\"%$!json%\\n\")\n"
+           "template(name=\"korvex_json\" type=\"string\" string=\"%$!korvex%\\n\")\n"
            "ruleset(name=\"korvex_out\") {\n"
            "    action(type=\"omfwd\" target=\"127.0.0.1\" port=\"10514\" protocol=\"tcp\"\n"
            "        template=\"korvex_json\" action.resumeRetryCount=\"-1\"\n"
@@ -24,28 +27,16 @@ std::string preamble(const std::string& source) {
            "}\n";
 }
 
-std::string templateOf(const ExportedFile& file) {
-    std::string all =
-        "\ntemplate(name=\"korvex_" + file.id + "\" type=\"list\" option.jsonf=\"on\") {\n";
-    const auto property = [&](const std::string& outname, const std::string& name) {
-        all += "    property(outname=\"" + outname + "\" name=\"" + name + "\" format=\"jsonf\")\n";
-    };
-    property("host", "hostname");
-    all += "    constant(outname=\"appender\" value=" + backslashed(file.appender) +
-           " format=\"jsonf\")\n";
-    for (const LineField* const field : namedFields(file.shape))
-        property(nameOf(field->kind), std::string("$!korvex!") + nameOf(field->kind));
-    property("message", "$!korvex!message");
-    return all + "}\n";
-}
-
-// The fields as the template wants them: the time in one piece, names without padding.
+// The time in one piece, names without padding.
 std::string repairs(const RuleBase& base) {
     std::string time = "$!korvex!time1";
-    for (std::size_t i = 0; i < base.timeJoints.size(); ++i)
-        time +=
-            " & " + backslashed(base.timeJoints[i]) + " & $!korvex!time" + std::to_string(i + 2);
-    std::string all = "        set $!korvex!time = " + time + ";\n";
+    std::string pieces = "        unset $!korvex!time1;\n";
+    for (std::size_t i = 0; i < base.timeJoints.size(); ++i) {
+        const std::string piece = "$!korvex!time" + std::to_string(i + 2);
+        time += " & " + backslashed(base.timeJoints[i]) + " & " + piece;
+        pieces += "        unset " + piece + ";\n";
+    }
+    std::string all = "        set $!korvex!time = " + time + ";\n" + pieces;
     for (const std::string& name : base.padded)
         all += "        set $!korvex!" + name + " = ltrim(rtrim($!korvex!" + name + "));\n";
     return all;
@@ -56,15 +47,16 @@ std::string rulesetOf(const ExportedFile& file) {
     std::string rules;
     for (const std::string& rule : base.rules)
         rules += (rules.empty() ? "" : ",\n") + std::string("        ") + backslashed(rule);
-    return "ruleset(name=\"korvex_" + file.id + "\") {\n" +
+    return "\nruleset(name=\"korvex_" + file.id + "\") {\n" +
            "    action(type=\"mmnormalize\" path=\"$!korvex\" rule=[\n" + rules + "\n    ])\n" +
            "    if $parsesuccess == \"OK\" then {\n" + repairs(base) +
            "    } else {\n"
            "        set $!korvex!message = $msg;  # no line of this layout: as it is\n"
            "    }\n"
-           "    set $!json = exec_template(\"korvex_" +
-           file.id +
-           "\");\n"
+           "    set $!korvex!host = $hostname;\n    set $!korvex!offset = $!metadata!fileoffset;\n "
+           "   set $!korvex!appender = " +
+           backslashed(file.appender) +
+           ";\n"
            "    call korvex_out\n"
            "}\n";
 }
@@ -73,7 +65,7 @@ std::string inputOf(const ExportedFile& file) {
     return "input(type=\"imfile\" file=" + backslashed(file.path) + " tag=\"korvex_" + file.id +
            "\" ruleset=\"korvex_" + file.id +
            "\"\n    startmsg.regex=" + backslashed(headRegex(file.shape, kPosixStyle, false)) +
-           "\n    escapeLF=\"off\" readTimeout=\"5\")\n";
+           "\n    escapeLF=\"off\" addMetadata=\"on\" readTimeout=\"5\")\n";
 }
 
 }  // namespace
@@ -81,6 +73,6 @@ std::string inputOf(const ExportedFile& file) {
 std::string writeRsyslog(const ExportedFiles& files, const std::string& source) {
     std::string all = preamble(source);
     for (const ExportedFile& file : files)
-        all += templateOf(file) + rulesetOf(file) + inputOf(file);
+        all += rulesetOf(file) + inputOf(file);
     return all;
 }

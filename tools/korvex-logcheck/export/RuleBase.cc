@@ -15,12 +15,22 @@ std::string ruleText(const std::string& text) {
     return all;
 }
 
+// A JSON string in a rule. liblognorm 2.0.6 crashes at a percent sign in it.
+std::string ruleString(const std::string& text) {
+    std::string all;
+    for (const char c : jsonString(text))
+        all += c == '%' ? "\\u0025" : std::string(1, c);
+    return all;
+}
+
 std::string parser(const std::string& name, const std::string& type, const std::string& more = "") {
-    return "%{\"name\":" + jsonString(name) + ",\"type\":\"" + type + '"' + more + "}%";
+    return "%{\"name\":" + ruleString(name) + ",\"type\":\"" + type + '"' + more + "}%";
 }
 
 std::string upTo(const std::string& name, const std::string& end) {
-    return parser(name, "string-to", ",\"extradata\":" + jsonString(end));
+    // string-to finds no string of one byte.
+    return parser(name, end.size() == 1 ? "char-to" : "string-to",
+                  ",\"extradata\":" + ruleString(end));
 }
 
 std::string nameFor(const LineField& field) {
@@ -69,7 +79,7 @@ class RuleWriter {
 
     void addLevel(const LevelWord& word, const std::string& name) {
         _rule += ruleText(word.before) +
-                 parser(name, "literal", ",\"text\":" + jsonString(word.word)) +
+                 parser(name, "literal", ",\"text\":" + ruleString(word.word)) +
                  ruleText(word.behind);
     }
 
@@ -102,8 +112,7 @@ class RuleWriter {
     void addTime(const LineField& field) {
         unsigned pieces = 0;
         const auto flush = [&](const std::string& end) {
-            const std::string name =
-                field.repeated ? "-" : "time" + std::to_string(++pieces);
+            const std::string name = field.repeated ? "-" : "time" + std::to_string(++pieces);
             _rule += isBlank(end.substr(0, 1)) ? parser(name, "word") : upTo(name, end);
         };
         std::string plain;  // of the piece: what its end must not look like

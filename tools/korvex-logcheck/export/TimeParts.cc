@@ -103,8 +103,14 @@ std::vector<TimePart> timePartsOf(const LayoutPiece& piece) {
     } else if (length < piece.minWidth) {
         const unsigned missing = piece.minWidth - length;
         if (missing > 1000) throw Doubt("its date is padded to a width that cannot be meant");
-        const TimePart padding{0, std::string(missing, piece.padding != 0 ? piece.padding : ' ')};
-        parts.insert(piece.padding != 0 ? parts.begin() : parts.end(), padding);
+        const std::string padding(missing, piece.padding != 0 ? piece.padding : ' ');
+        if (piece.padding == 0) {
+            addText(parts, padding);
+        } else if (!parts.empty() && parts.front().letter == 0) {
+            parts.front().text.insert(0, padding);
+        } else {
+            parts.insert(parts.begin(), {0, padding});
+        }
     }
     return parts;
 }
