@@ -230,6 +230,41 @@ TEST_F(RecordFileManagerTest, RemoveSavesOnlyWhenTheKeyWasThere) {
     EXPECT_EQ(readFile(_file), kVersionRecord + record("b", "2"));
 }
 
+TEST_F(RecordFileManagerTest, SeveralMayBeRemovedWithOneSave) {
+    EXPECT_EQ(run([this] {
+                  for (const char* key : {"a", "b", "c", "d"})
+                      put(key, "1");
+                  store().saveToFile();
+                  const std::string before = readFile(_file);
+                  const bool absent = store().remove("x", false);
+                  const bool first = store().remove("a", false);
+                  const bool again = store().remove("a", false);
+                  const bool untouched = readFile(_file) == before && get("a") == "(absent)";
+                  const bool absentAndNotSaved =
+                      !store().remove("y", true) && readFile(_file) == before;
+                  const bool last = store().remove("b", true);
+                  if (!absent && first && !again && untouched && absentAndNotSaved && last)
+                      fputs("ok", stdout);
+              }),
+              "");
+    EXPECT_EQ(_out, "ok");
+    EXPECT_EQ(readFile(_file), kVersionRecord + record("c", "1") + record("d", "1"));
+}
+
+TEST_F(RecordFileManagerTest, RemovingWithoutASaveNeedsNoFileName) {
+    const ChildResult result = runInChild([] {
+        put("a", "1");
+        put("b", "2");
+        if (store().remove("a", false)) fputs(joined(all()).c_str(), stdout);
+        fputs(thrownBy([] { store().remove("b", true); }).c_str(), stdout);
+        fputs(joined(all()).c_str(), stdout);
+        return 0;
+    });
+    EXPECT_EQ(result.out, "b=2;Tried to write to db without setting filename.")
+        << "the record is gone whatever the save does";
+    EXPECT_EQ(result.err, "Tried to write to db without setting filename.\n");
+}
+
 TEST_F(RecordFileManagerTest, EnumerateMatchesThePrefixAndAppends) {
     run([] {
         for (const char* key : {"abc", "ab", "a", "AB", "b", "abd\xff"})

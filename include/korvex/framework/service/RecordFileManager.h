@@ -75,6 +75,9 @@ class RecordFileManager {
     // Removes the record and saves everything; false, and nothing saved, when the key is absent.
     // Throws what saveToFile() throws, the record being gone.
     bool remove(const std::string& key);
+    // The same, but saves only if writeToFile is true: for removing several with one save, the last
+    // one's.
+    bool remove(const std::string& key, bool writeToFile);
     // Appends copies of the records whose keys begin with partialKey, in byte-wise key order; ""
     // matches all. Whether there was any. See PersistentFullData for who frees.
     bool enumerate(const std::string& partialKey,

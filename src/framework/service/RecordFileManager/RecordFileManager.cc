@@ -104,11 +104,15 @@ void RecordFileManager::get(const std::string& key, PersistentHashData& dataToRe
 }
 
 bool RecordFileManager::remove(const std::string& key) {
+    return remove(key, true);
+}
+
+bool RecordFileManager::remove(const std::string& key, bool writeToFile) {
     const auto found = records.find(key);
     if (found == records.end()) return false;
     std::free(found->second.second);
     records.erase(found);
-    saveToFile();
+    if (writeToFile) saveToFile();
     return true;
 }
 
