@@ -1,0 +1,142 @@
+#include <korvex/util/Logger.h>
+
+#include <memory>
+
+#include "points/Process.h"
+#include "scenarios/Logging.h"
+#include "scenarios/Parallel.h"
+
+// Forks while other threads log. The child has none of them, and everything as they left it.
+
+namespace schedules {
+
+namespace {
+
+constexpr const char* kDated = "rootCategory=INFO,A\nappender.A=File\nappender.A.fileName=log\n"
+                               "appender.A.layout.ConversionPattern=%d{%Y} %m%n\n";
+
+void withDates() {
+    configure(kDated);
+    Logger logger("test");
+    Parallel threads{[&] { logger.info(std::string("parent")); }};
+    inForkedChild([&] { logger.info(std::string("child")); });
+    threads.join();
+}
+
+std::string checkDates(const Remains& remains) {
+    return compare("the log", Remains::lines(remains.file("log")), {"2026 parent", "2026 child"});
+}
+
+void printf() {
+    configure("rootCategory=INFO,A\nappender.A=File\nappender.A.fileName=log\n");
+    Logger logger("test");
+    Parallel threads{[&] { logger.info("%s", "parent"); }};
+    inForkedChild([&] { logger.info("%s", "child"); });
+    threads.join();
+}
+
+std::string checkPrintf(const Remains& remains) {
+    return compare("the log", Remains::lines(remains.file("log")), {"parent", "child"});
+}
+
+// The first failing line of each.
+void failing() {
+    configure("rootCategory=INFO,A\nappender.A=File\nappender.A.fileName=/dev/full\n");
+    Logger logger("test");
+    Parallel threads{[&] { logger.info(std::string("parent")); }};
+    inForkedChild([&] { logger.info(std::string("child")); });
+    threads.join();
+}
+
+std::string checkFailing(const Remains& remains) {
+    const std::string line = "CRIT - Error writing to \"/dev/full\": No space left on device";
+    return compare("standard error", Remains::lines(remains.err), {line, line});
+}
+
+// Before anything is configured, a failing line takes other ways.
+void failingEarly() {
+    require(LogAppender::find("A", true)->setAttribute("fileName", "/dev/full", Pathname()),
+            "the file's name is refused");
+    LogChannel::find("", false)->setConfig("INFO,A");
+    Logger logger("test");
+    Parallel threads{[&] { logger.info(std::string("parent")); }};
+    inForkedChild([&] { logger.info(std::string("child")); });
+    threads.join();
+}
+
+std::string checkFailingEarly(const Remains& remains) {
+    const std::string line = "Error writing to \"/dev/full\": No space left on device";
+    return compare("standard error", Remains::lines(remains.err), {line, line});
+}
+
+// All that a line can hold, for the first time in the process.
+void firstLines() {
+    require(LogAppender::find("A", true)->setAttribute("fileName", "log", Pathname()) &&
+                LogAppender::find("A", true)->setAttribute("layout.ConversionPattern", "%R %m%n",
+                                                           Pathname()),
+            "an attribute is refused");
+    LogChannel::find("", false)->setConfig("INFO,A");
+    Parallel threads{[&] {
+        Logger logger("parent");
+        logger.info("%s", "parent");
+    }};
+    inForkedChild([&] {
+        Logger logger("child");
+        logger.info("%s", "child");
+    });
+    threads.join();
+}
+
+std::string checkFirstLines(const Remains& remains) {
+    return compare("the log", Remains::lines(remains.file("log")), {"0 parent", "0 child"});
+}
+
+void childUsesRegistries() {
+    configure("rootCategory=INFO,A\nappender.A=File\nappender.A.fileName=log\n");
+    Parallel threads{[&] {
+        Logger::setChannelLevel("one", "DEBUG");
+        Logger one("one");
+        one.debug("parent");
+    }};
+    inForkedChild([&] {
+        Logger::setChannelLevel("one", "DEBUG");
+        Logger one("one");
+        one.debug("child");
+    });
+    threads.join();
+}
+
+// A handler that a static initialiser of the process registered before the library's own.
+Logger* handlersLogger = nullptr;
+
+void handlerLogs() {
+    configure("rootCategory=INFO,A\nappender.A=File\nappender.A.fileName=log\n"
+              "appender.A.layout.ConversionPattern=%d{%Y} %m%n\n");
+    Logger logger("test");
+    handlersLogger = &logger;
+    atForkFromTheBeginning([] { handlersLogger->info("prepare"); },
+                           [] { handlersLogger->info("parent"); },
+                           [] { handlersLogger->info("child"); });
+    Parallel threads{[&] { logger.info(std::string("other")); }};
+    inForkedChild([] {});
+    threads.join();
+}
+
+std::string checkHandler(const Remains& remains) {
+    return compare("the log", Remains::lines(remains.file("log")),
+                   {"2026 prepare", "2026 parent", "2026 child", "2026 other"});
+}
+
+const Register registered{
+    {"fork-with-dates", &withDates, &checkDates},
+    {"fork-printf", &printf, &checkPrintf},
+    {"fork-failing", &failing, &checkFailing},
+    {"fork-failing-early", &failingEarly, &checkFailingEarly},
+    {"fork-first-lines", &firstLines, &checkFirstLines},
+    {"fork-registries", &childUsesRegistries, &checkPrintf},
+    {"fork-handler-logs", &handlerLogs, &checkHandler},
+};
+
+}  // namespace
+
+}  // namespace schedules
