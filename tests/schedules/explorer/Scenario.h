@@ -22,6 +22,7 @@ struct Scenario {
     const char* name;
     void (*body)();
     // In the explorer, after each run that ended well: what is wrong with what it left, or nothing.
+    // Must leave no trace in the process: the next run begins as the first one did.
     std::string (*check)(const Remains& remains) = nullptr;
     // For scenarios that are there to be found wanting: a part of what must be said of one.
     const char* wanted = nullptr;

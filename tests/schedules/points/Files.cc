@@ -4,8 +4,9 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
+#include <algorithm>
 #include <cstdarg>
-#include <cstddef>
+#include <cstdio>
 #include <functional>
 #include <string_view>
 
@@ -15,10 +16,14 @@
 
 namespace schedules {
 
+// By its path, because inode numbers are not the same in every run.
 const void* fileOf(int fd) {
-    struct stat st {};
-    if (fstat(fd, &st) != 0) return reinterpret_cast<const void*>(1);
-    return reinterpret_cast<const void*>(static_cast<std::size_t>(st.st_ino) << 8 | 1);
+    char link[40];
+    char path[4096];
+    std::snprintf(link, sizeof link, "/proc/self/fd/%d", fd);
+    const ssize_t length = readlink(link, path, sizeof path - 1);
+    path[std::max<ssize_t>(length, 0)] = '\0';
+    return pathOf(path);
 }
 
 const void* pathOf(const char* path) {

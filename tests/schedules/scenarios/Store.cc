@@ -22,9 +22,8 @@ std::string field(const std::string& text) {
 }
 
 // More than any stream's buffer holds, so that saving takes several writes.
-const std::string& largeValue() {
-    static const std::string value(70000, 'v');
-    return value;
+std::string largeValue() {
+    return std::string(70000, 'v');
 }
 
 void useFile() {
@@ -77,10 +76,29 @@ std::string checkForked(const Remains& remains) {
 }
 
 // The child's exit must not write what is the parent's.
-void exitInForkedChild() {
+void exitInChildOfPut() {
     useFile();
     put("a", largeValue(), false);
     Parallel threads{[] { put("b", "2", true); }};
+    inForkedChild([] { std::exit(0); });
+    threads.join();
+}
+
+void exitInChildOfSave() {
+    useFile();
+    put("a", largeValue(), false);
+    put("b", "2", false);
+    Parallel threads{[] { RecordFileManager::instance()->saveToFile(); }};
+    inForkedChild([] { std::exit(0); });
+    threads.join();
+}
+
+void exitInChildOfRemove() {
+    useFile();
+    put("a", largeValue(), false);
+    put("b", "2", false);
+    put("c", "3", false);
+    Parallel threads{[] { RecordFileManager::instance()->remove("c"); }};
     inForkedChild([] { std::exit(0); });
     threads.join();
 }
@@ -131,7 +149,9 @@ const Register registered{
     {"put-beside-put", &putBesidePut, &checkBoth},
     {"put-the-same", &putTheSame, &checkEither},
     {"fork-beside-put", &forkBesidePut, &checkForked},
-    {"exit-in-forked-child", &exitInForkedChild, &checkForkedExit},
+    {"exit-in-child-of-put", &exitInChildOfPut, &checkForkedExit},
+    {"exit-in-child-of-remove", &exitInChildOfRemove, &checkForkedExit},
+    {"exit-in-child-of-save", &exitInChildOfSave, &checkForkedExit},
     {"exit-beside-put", &exitBesidePut, &checkExit},
     {"exit-beside-save", &exitBesideSave, &checkExit},
     {"exit-beside-remove", &exitBesideRemove, &checkRemove},

@@ -1,5 +1,7 @@
 #include "strategies/Bounded.h"
 
+#include <algorithm>
+
 #include "strategies/Course.h"
 
 namespace schedules {
@@ -43,11 +45,28 @@ bool Bounded::step(Result& result, unsigned level) {
     Course course(schedule);
     ++_runs;
     result.failure = _runner.run(_scenario, course);
+    if (result.failure.empty() && !wasFollowed(schedule)) {
+        result.failure = "the run went another way than the one before it";
+    }
     if (!result.failure.empty()) {
         result.schedule = std::move(schedule);
         return false;
     }
     addDepartures(schedule);
+    return true;
+}
+
+// A run depends on nothing but its schedule, or nothing that is said here is true.
+bool Bounded::wasFollowed(const Schedule& schedule) const {
+    const Board& board = _runner.board();
+    const Decision* decision = board.decision;
+    for (const Departure& departure : schedule.departures) {
+        const auto made = [&departure](const Decision& d) {
+            return d.step == departure.step && d.chosen == departure.thread;
+        };
+        decision = std::find_if(decision, board.decision + board.decisions, made);
+        if (decision == board.decision + board.decisions) return false;
+    }
     return true;
 }
 

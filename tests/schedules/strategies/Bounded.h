@@ -31,6 +31,7 @@ class Bounded {
   private:
     void startOver();
     bool step(Result& result, unsigned preemptions);
+    bool wasFollowed(const Schedule& schedule) const;
     static bool isUnforced(const Decision& decision, unsigned thread);
     void addDepartures(const Schedule& from);
 
