@@ -9,6 +9,7 @@
 #include <cstring>
 #include <new>
 
+#include "explorer/Races.h"
 #include "explorer/Scheduler.h"
 
 namespace schedules {
@@ -62,12 +63,14 @@ void* Heap::allocate(std::size_t size) {
     return memory + (first + pages) * kPage - needed;
 }
 
-bool Heap::free(void* object) {
+bool Heap::free(void* object, const void* caller) {
     if (!owns(object)) return false;
     const std::size_t first = pageNumber(object);
     if (pagesOf[first] == 0) Scheduler::instance().fail("an object is freed twice");
     char* const end = memory + (first + pagesOf[first]) * kPage;
-    Scheduler::instance().freed(object, static_cast<std::size_t>(end - static_cast<char*>(object)));
+    const auto size = static_cast<std::size_t>(end - static_cast<char*>(object));
+    Scheduler::instance().freed(object, size);
+    Races::freed(object, size, caller);
     mprotect(memory + first * kPage, pagesOf[first] * kPage, PROT_NONE);
     pagesOf[first] = 0;
     return true;
@@ -93,20 +96,20 @@ void* operator new[](std::size_t size, const std::nothrow_t&) noexcept {
     return operator new(size);
 }
 void operator delete(void* object) noexcept {
-    if (!Heap::free(object)) std::free(object);
+    if (!Heap::free(object, __builtin_return_address(0))) std::free(object);
 }
 void operator delete[](void* object) noexcept {
-    operator delete(object);
+    if (!Heap::free(object, __builtin_return_address(0))) std::free(object);
 }
 void operator delete(void* object, std::size_t) noexcept {
-    operator delete(object);
+    if (!Heap::free(object, __builtin_return_address(0))) std::free(object);
 }
 void operator delete[](void* object, std::size_t) noexcept {
-    operator delete(object);
+    if (!Heap::free(object, __builtin_return_address(0))) std::free(object);
 }
 void operator delete(void* object, const std::nothrow_t&) noexcept {
-    operator delete(object);
+    if (!Heap::free(object, __builtin_return_address(0))) std::free(object);
 }
 void operator delete[](void* object, const std::nothrow_t&) noexcept {
-    operator delete(object);
+    if (!Heap::free(object, __builtin_return_address(0))) std::free(object);
 }

@@ -17,7 +17,7 @@ class Heap {
     // Null when the heap is not guarding yet: then malloc(3) does.
     static void* allocate(std::size_t size);
     // False: not an object of this heap.
-    static bool free(void* object);
+    static bool free(void* object, const void* caller);
     // Whether the address is, or has been, an object's.
     static bool owns(const void* address);
 };

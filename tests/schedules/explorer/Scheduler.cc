@@ -8,6 +8,8 @@
 
 #include "explorer/SharedObjects.h"
 
+extern "C" int __real_vsnprintf(char*, size_t, const char*, va_list);
+
 namespace schedules {
 
 namespace {
@@ -79,13 +81,17 @@ Turn Scheduler::point(const Operation& operation) {
 }
 
 void Scheduler::note(const ThreadState& self) {
-    if (_board->steps == kMaxSteps) fail("no end after %u operations", kMaxSteps);
+    if (_board->steps == kMaxSteps - 2) fail("no end after %u operations", _board->steps);
     const Operation& next = self.next;
-    _board->step[_board->steps++] = {next.what, next.object, next.caller,
-                                     static_cast<std::uint8_t>(self.number), _forkedChild};
+    write({next.what, next.object, next.caller, static_cast<std::uint8_t>(self.number),
+           _forkedChild});
     if (next.object == nullptr || (alone() && !_forkedChild)) return;
     if (objects.use(next.object, self.number, next.access == Operation::CHANGES))
         tellShared(next.object);
+}
+
+void Scheduler::write(const Step& step) {
+    _board->step[_board->steps++] = step;
 }
 
 void Scheduler::freed(const void* memory, std::size_t size) {
@@ -191,12 +197,24 @@ void Scheduler::failForDeadlock() {
 }
 
 void Scheduler::fail(const char* fmt, ...) {
+    va_list ap;
+    va_start(ap, fmt);
+    endFailed(fmt, ap);
+}
+
+void Scheduler::failAt(const void* caller, const void* otherCaller, const char* fmt, ...) {
+    const auto number = static_cast<std::uint8_t>(selfState->number);
+    write({"the other one", nullptr, otherCaller, number, _forkedChild});
+    write({"this one", nullptr, caller, number, _forkedChild});
+    va_list ap;
+    va_start(ap, fmt);
+    endFailed(fmt, ap);
+}
+
+void Scheduler::endFailed(const char* fmt, va_list ap) {
     if (_board != nullptr && !_board->failed) {
         _board->failed = true;
-        va_list ap;
-        va_start(ap, fmt);
-        std::vsnprintf(_board->failure, sizeof _board->failure, fmt, ap);
-        va_end(ap);
+        __real_vsnprintf(_board->failure, sizeof _board->failure, fmt, ap);
     }
     _exit(kFailed);
 }

@@ -3,6 +3,7 @@
 #include <pthread.h>
 #include <semaphore.h>
 
+#include <cstdarg>
 #include <cstddef>
 #include <cstdint>
 
@@ -104,6 +105,8 @@ class Scheduler {
     bool inForkedChild() const { return _forkedChild; }
 
     // Ends the run.
+    [[noreturn]] void failAt(const void* caller, const void* otherCaller, const char* fmt, ...)
+        __attribute__((format(printf, 4, 5)));
     [[noreturn]] void fail(const char* fmt, ...) __attribute__((format(printf, 2, 3)));
 
     static constexpr int kFailed = 97;  // exit status of a run that failed
@@ -112,9 +115,12 @@ class Scheduler {
     unsigned choose(ThreadState& self, bool matters);
     void handOver(ThreadState& from, ThreadState& to);
     void note(const ThreadState& self);
+    void write(const Step& step);
     void tellShared(const void* object);
     bool isShared(const void* object) const;
     [[noreturn]] void failForDeadlock();
+    [[noreturn]] void endFailed(const char* fmt, va_list ap)
+        __attribute__((format(printf, 2, 0)));
 
     Board* _board = nullptr;
     Strategy* _strategy = nullptr;

@@ -1,5 +1,6 @@
 #include <cstdint>
 
+#include "explorer/Races.h"
 #include "points/Wrap.h"
 
 // The library of this test is compiled with -fsanitize=thread, and not linked with the sanitizer's
@@ -45,37 +46,52 @@ void forgetLook() {
     if (scheduler().running()) scheduler().self().looksAt = nullptr;
 }
 
+// Memory orders as the compiler numbers them.
+bool acquires(int order) {
+    return order == __ATOMIC_ACQUIRE || order == __ATOMIC_CONSUME || order == __ATOMIC_ACQ_REL ||
+           order == __ATOMIC_SEQ_CST;
+}
+bool releases(int order) {
+    return order == __ATOMIC_RELEASE || order == __ATOMIC_ACQ_REL || order == __ATOMIC_SEQ_CST;
+}
+
 template <class T>
-T load(const volatile T* object, const void* caller) {
-    beforeLoad(const_cast<const T*>(object), caller);
+T load(const volatile T* object, int order, const void* caller) {
+    const void* const address = const_cast<const T*>(object);
+    beforeLoad(address, caller);
+    if (acquires(order)) Races::acquire(address);
     return *object;
 }
 
-// Seen by the others before the thread goes on: there are points on both sides.
 template <class T>
-void store(volatile T* object, T value, const void* caller) {
+void store(volatile T* object, T value, int order, const void* caller) {
     const void* const address = const_cast<const T*>(object);
     announce("store", address, caller);
     *object = value;
     forgetLook();
-    announce("have stored", address, caller);
+    if (releases(order)) {
+        Races::release(address);
+    } else {
+        Races::forget(address);
+    }
 }
 
 template <class T, class Change>
-T change(volatile T* object, Change newValue, const void* caller) {
+T change(volatile T* object, Change newValue, int order, const void* caller) {
     const void* const address = const_cast<const T*>(object);
     announce("change", address, caller);
     const T old = *object;
     *object = newValue(old);
     forgetLook();
-    announce("have changed", address, caller);
+    if (acquires(order)) Races::acquire(address);
+    if (releases(order)) Races::releaseMore(address);
     return old;
 }
 
 template <class T>
-bool exchangeIf(volatile T* object, T* expected, T value, const void* caller) {
+bool exchangeIf(volatile T* object, T* expected, T value, int order, const void* caller) {
     const T old = change(
-        object, [&](T present) { return present == *expected ? value : present; }, caller);
+        object, [&](T present) { return present == *expected ? value : present; }, order, caller);
     const bool equal = old == *expected;
     *expected = old;
     return equal;
@@ -86,35 +102,38 @@ bool exchangeIf(volatile T* object, T* expected, T value, const void* caller) {
 }  // namespace schedules
 
 #define CALLER SCHEDULES_CALLER
-#define FETCH(bits, type, name, expression)                                                    \
-    extern "C" type __tsan_atomic##bits##_##name(volatile type* object, type operand, int);    \
-    extern "C" type __tsan_atomic##bits##_##name(volatile type* object, type operand, int) {   \
-        return schedules::change(                                                              \
-            object, [operand](type old) { return static_cast<type>(expression); }, CALLER);    \
+#define FETCH(bits, type, name, expression)                                                       \
+    extern "C" type __tsan_atomic##bits##_##name(volatile type* object, type operand, int order); \
+    extern "C" type __tsan_atomic##bits##_##name(volatile type* object, type operand,             \
+                                                 int order) {                                     \
+        return schedules::change(                                                                 \
+            object, [operand](type old) { return static_cast<type>(expression); }, order,         \
+            CALLER);                                                                              \
     }
-#define EXCHANGE_IF(bits, type, name)                                                           \
-    extern "C" int __tsan_atomic##bits##_##name(volatile type* object, type* expected,          \
-                                                type value, int, int);                          \
-    extern "C" int __tsan_atomic##bits##_##name(volatile type* object, type* expected,          \
-                                                type value, int, int) {                         \
-        return schedules::exchangeIf(object, expected, value, CALLER);                          \
+#define EXCHANGE_IF(bits, type, name)                                                     \
+    extern "C" int __tsan_atomic##bits##_##name(volatile type* object, type* expected,    \
+                                                type value, int order, int);              \
+    extern "C" int __tsan_atomic##bits##_##name(volatile type* object, type* expected,    \
+                                                type value, int order, int) {             \
+        return schedules::exchangeIf(object, expected, value, order, CALLER);             \
     }
-#define ATOMICS(bits, type)                                                                    \
-    extern "C" type __tsan_atomic##bits##_load(const volatile type* object, int);              \
-    extern "C" type __tsan_atomic##bits##_load(const volatile type* object, int) {             \
-        return schedules::load(object, CALLER);                                                \
-    }                                                                                          \
-    extern "C" void __tsan_atomic##bits##_store(volatile type* object, type value, int);       \
-    extern "C" void __tsan_atomic##bits##_store(volatile type* object, type value, int) {      \
-        schedules::store(object, value, CALLER);                                               \
-    }                                                                                          \
-    FETCH(bits, type, exchange, (static_cast<void>(old), operand))                             \
-    FETCH(bits, type, fetch_add, old + operand)                                                \
-    FETCH(bits, type, fetch_sub, old - operand)                                                \
-    FETCH(bits, type, fetch_and, old& operand)                                                 \
-    FETCH(bits, type, fetch_or, old | operand)                                                 \
-    FETCH(bits, type, fetch_xor, old ^ operand)                                                \
-    EXCHANGE_IF(bits, type, compare_exchange_strong)                                           \
+#define ATOMICS(bits, type)                                                                  \
+    extern "C" type __tsan_atomic##bits##_load(const volatile type* object, int order);      \
+    extern "C" type __tsan_atomic##bits##_load(const volatile type* object, int order) {     \
+        return schedules::load(object, order, CALLER);                                       \
+    }                                                                                        \
+    extern "C" void __tsan_atomic##bits##_store(volatile type* object, type value, int order); \
+    extern "C" void __tsan_atomic##bits##_store(volatile type* object, type value,           \
+                                                int order) {                                 \
+        schedules::store(object, value, order, CALLER);                                      \
+    }                                                                                        \
+    FETCH(bits, type, exchange, (static_cast<void>(old), operand))                           \
+    FETCH(bits, type, fetch_add, old + operand)                                              \
+    FETCH(bits, type, fetch_sub, old - operand)                                              \
+    FETCH(bits, type, fetch_and, old& operand)                                               \
+    FETCH(bits, type, fetch_or, old | operand)                                               \
+    FETCH(bits, type, fetch_xor, old ^ operand)                                              \
+    EXCHANGE_IF(bits, type, compare_exchange_strong)                                         \
     EXCHANGE_IF(bits, type, compare_exchange_weak)
 
 ATOMICS(8, std::uint8_t)
@@ -125,6 +144,9 @@ ATOMICS(64, std::uint64_t)
 extern "C" {
 void __tsan_atomic_thread_fence(int);
 void __tsan_atomic_signal_fence(int);
-void __tsan_atomic_thread_fence(int) {}
+// There is none in the library. One that came would have to be modelled.
+void __tsan_atomic_thread_fence(int) {
+    schedules::scheduler().fail("a thread fence, which the explorer does not know");
+}
 void __tsan_atomic_signal_fence(int) {}
 }

@@ -15,5 +15,5 @@ SCHEDULES_WRAP(void*, calloc, (size_t n, size_t size)) {
 }
 
 SCHEDULES_WRAP(void, free, (void* block)) {
-    if (!schedules::Heap::free(block)) __real_free(block);
+    if (!schedules::Heap::free(block, SCHEDULES_CALLER)) __real_free(block);
 }

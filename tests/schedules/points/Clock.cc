@@ -62,6 +62,6 @@ SCHEDULES_WRAP(size_t, strftime, (char* buf, size_t n, const char* fmt, const st
 }
 
 SCHEDULES_WRAP(int, vsnprintf, (char* buf, size_t n, const char* fmt, va_list ap)) {
-    schedules::announce("vsnprintf", fmt, SCHEDULES_CALLER);
+    schedules::announce("vsnprintf", nullptr, SCHEDULES_CALLER);
     return __real_vsnprintf(buf, n, fmt, ap);
 }

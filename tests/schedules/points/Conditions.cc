@@ -35,7 +35,7 @@ int waitFor(pthread_cond_t* condition, MutexModel& mutex, Operation::Patience pa
     ConditionModel::of(condition).mustLive("wait on");
     announce("wait: let go of the lock", &mutex, caller);
     ThreadState& self = scheduler().self();
-    mutex.heldBy = 0;
+    mutex.letGo();
     self.condition = condition;
     self.signalled = false;
     self.waitsSince = scheduler().nextWait();

@@ -2,6 +2,7 @@
 
 #include <pthread.h>
 
+#include "explorer/Races.h"
 #include "points/Wrap.h"
 
 namespace schedules {
@@ -20,7 +21,14 @@ struct MutexModel {
     }
     static bool canLock(void* model) { return static_cast<MutexModel*>(model)->isFree(); }
 
-    void take() { heldBy = scheduler().running() ? scheduler().self().number + 1 : 1; }
+    void take() {
+        heldBy = scheduler().running() ? scheduler().self().number + 1 : 1;
+        Races::acquire(this);
+    }
+    void letGo() {
+        heldBy = 0;
+        Races::release(this);
+    }
     void lock(const char* what, const void* caller);
     void unlock(const char* what, const void* caller);
 };

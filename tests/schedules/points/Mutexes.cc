@@ -14,12 +14,10 @@ void MutexModel::lock(const char* what, const void* caller) {
     take();
 }
 
-// The point after it lets the others see the lock free before this thread does anything else.
 void MutexModel::unlock(const char* what, const void* caller) {
     announce(what, this, caller);
     if (isFree() || heldBy == kDestroyed) scheduler().fail("%s of a lock that is not held", what);
-    heldBy = 0;
-    announce("have unlocked", this, caller);
+    letGo();
 }
 
 }  // namespace schedules

@@ -1,5 +1,6 @@
 #include <cstdint>
 
+#include "explorer/Races.h"
 #include "points/Wrap.h"
 
 // The building of function-local statics: one thread builds, the others wait for it.
@@ -29,7 +30,10 @@ SCHEDULES_WRAP(int, __cxa_guard_acquire, (std::uint64_t * address)) {
     operation.ready = &Guard::canGoOn;
     operation.argument = &guard;
     schedules::scheduler().point(operation);
-    if (guard.built != 0) return 0;
+    if (guard.built != 0) {
+        schedules::Races::acquire(address);
+        return 0;
+    }
     guard.building = 1;
     return 1;
 }
@@ -39,6 +43,7 @@ SCHEDULES_WRAP(void, __cxa_guard_release, (std::uint64_t * address)) {
     schedules::announce("have built a static", &guard, SCHEDULES_CALLER);
     guard.building = 0;
     guard.built = 1;
+    schedules::Races::release(address);
 }
 
 SCHEDULES_WRAP(void, __cxa_guard_abort, (std::uint64_t * address)) {

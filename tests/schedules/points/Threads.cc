@@ -1,6 +1,7 @@
 #include <cerrno>
 #include <cstring>
 
+#include "explorer/Races.h"
 #include "points/ThreadSpecific.h"
 #include "points/Wrap.h"
 
@@ -12,6 +13,20 @@ SCHEDULES_REAL(int, pthread_detach, (pthread_t));
 namespace schedules {
 
 namespace {
+
+// Each thread has a stack of its own, which no later one gets: so addresses are the same in every
+// run, and an object on it is never taken for one of an earlier thread.
+constexpr std::size_t kStack = 256 << 10;
+alignas(4096) char stacks[kMaxThreads][kStack];
+
+int startThread(ThreadState& thread, void* (*main)(void*)) {
+    pthread_attr_t attributes;
+    pthread_attr_init(&attributes);
+    pthread_attr_setstack(&attributes, stacks[thread.number], kStack);
+    const int error = __real_pthread_create(&thread.handle, &attributes, main, &thread);
+    pthread_attr_destroy(&attributes);
+    return error;
+}
 
 void* threadMain(void* argument) {
     ThreadState& self = *static_cast<ThreadState*>(argument);
@@ -41,15 +56,14 @@ using schedules::ThreadState;
 
 // The new thread may run before its creator has been told its handle.
 SCHEDULES_WRAP(int, pthread_create,
-               (pthread_t * handle, const pthread_attr_t* attributes, void* (*start)(void*),
-                void* argument)) {
+               (pthread_t * handle, const pthread_attr_t*, void* (*start)(void*), void* argument)) {
     schedules::announce("create a thread", handle, SCHEDULES_CALLER);
     ThreadState* const created = scheduler().add();
     if (created == nullptr) return EAGAIN;
     created->start = start;
     created->argument = argument;
-    const int error = __real_pthread_create(&created->handle, attributes, &schedules::threadMain,
-                                            created);
+    schedules::Races::beginThread(created->number, scheduler().self().number);
+    const int error = schedules::startThread(*created, &schedules::threadMain);
     if (error != 0) scheduler().fail("no thread: %s", std::strerror(error));
     schedules::announce("have created a thread", handle, SCHEDULES_CALLER);
     *handle = created->handle;
@@ -65,6 +79,7 @@ SCHEDULES_WRAP(int, pthread_join, (pthread_t handle, void** result)) {
     scheduler().point(operation);
     __real_pthread_join(handle, nullptr);
     thread.joined = true;
+    schedules::Races::joinThread(thread.number);
     if (result != nullptr) *result = thread.result;
     return 0;
 }
