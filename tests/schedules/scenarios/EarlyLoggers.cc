@@ -48,7 +48,21 @@ std::string checkUsed(const Remains& remains) {
     return compare("standard error", Remains::lines(remains.err), {"one", "two", "three"});
 }
 
+// The channel to which it is bound is made by a third thread.
+void boundToNewChannel() {
+    Logger early("net");
+    Parallel threads{[&] { early.info(std::string("one")); },
+                     [] { Logger::setChannelLevel("net", "DEBUG"); }};
+    Logger::initialize();
+    threads.join();
+}
+
+std::string checkOne(const Remains& remains) {
+    return compare("standard error", Remains::lines(remains.err), {"one"});
+}
+
 const Register registered{
+    {"early-logger-bound", &boundToNewChannel, &checkOne},
     {"early-logger-destroyed", &destroyed},
     {"early-loggers-listed", &listed},
     {"early-loggers-used", &used, &checkUsed},

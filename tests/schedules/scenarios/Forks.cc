@@ -106,6 +106,36 @@ void childUsesRegistries() {
     threads.join();
 }
 
+// Taken in one order there, in the same one here.
+void besideInitialize() {
+    Logger logger("test");
+    Parallel threads{[] { Logger::initialize(); }};
+    inForkedChild([&] { logger.info(std::string("child")); });
+    threads.join();
+    logger.info(std::string("parent"));
+}
+
+std::string checkStderr(const Remains& remains) {
+    return compare("standard error", Remains::lines(remains.err), {"parent", "child"});
+}
+
+// Each line makes the file a backup; the child goes on where its parent was.
+void rotating() {
+    configure("rootCategory=INFO,A\nappender.A=File\nappender.A.fileName=log\n"
+              "appender.A.maxFileSize=2\nappender.A.maxBackupIndex=5\n");
+    Logger logger("test");
+    Parallel threads{[&] { logger.info(std::string("parent")); }};
+    inForkedChild([&] { logger.info(std::string("child")); });
+    threads.join();
+}
+
+std::string checkRotating(const Remains& remains) {
+    std::string all;
+    for (const char* name : {"log", "log.1", "log.2", "log.3"})
+        all += remains.file(name);
+    return compare("the log with its backups", Remains::lines(all), {"parent", "child"});
+}
+
 // A handler that a static initialiser of the process registered before the library's own.
 Logger* handlersLogger = nullptr;
 
@@ -130,6 +160,8 @@ std::string checkHandler(const Remains& remains) {
 const Register registered{
     {"fork-with-dates", &withDates, &checkDates},
     {"fork-printf", &printf, &checkPrintf},
+    {"fork-beside-initialize", &besideInitialize, &checkStderr},
+    {"fork-rotating", &rotating, &checkRotating},
     {"fork-failing", &failing, &checkFailing},
     {"fork-failing-early", &failingEarly, &checkFailingEarly},
     {"fork-first-lines", &firstLines, &checkFirstLines},

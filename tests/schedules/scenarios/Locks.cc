@@ -55,6 +55,24 @@ void conditionWithTime() {
     require(seen || ready, "the condition is lost");
 }
 
+void twoWaiters() {
+    Mutex mutex;
+    ConditionWakeAll condition;
+    bool ready = false;
+    const auto wait = [&] {
+        const ScopedMutex lock(mutex);
+        while (!ready)
+            condition.wait(mutex);
+    };
+    Parallel threads{wait, wait};
+    {
+        const ScopedMutex lock(mutex);
+        ready = true;
+    }
+    condition.wake_all();
+    threads.join();
+}
+
 struct Counted {
     explicit Counted(std::atomic<int>& count) : _count(count) { ++_count; }
     Counted(const Counted&) = delete;
@@ -79,6 +97,7 @@ void specific() {
 
 const Register registered{
     {"lock-recursive", &recursive},
+    {"condition-two-waiters", &twoWaiters},
     {"condition-with-time", &conditionWithTime},
     {"thread-specific-pointers", &specific},
 };

@@ -72,6 +72,23 @@ std::string checkAcross(const Remains& remains) {
     return count(openError("no/f"), log) == 2 ? "" : "F's failure is not told twice:\n" + log;
 }
 
+// Each of the two is told of the other's failure, and fails at that.
+void intoEachOther() {
+    configure("rootCategory=INFO,F\ncategory.other=INFO,G\ncategory.Logger=INFO,F,G\n" +
+              failing("F", "no/f") + failing("G", "no/g"));
+    Logger logger("test");
+    Logger other("other");
+    Parallel threads{[&] { other.info(std::string("one")); }};
+    logger.info(std::string("two"));
+    threads.join();
+}
+
+std::string checkIntoEachOther(const Remains& remains) {
+    const unsigned f = count(openError("no/f"), remains.err);
+    const unsigned g = count(openError("no/g"), remains.err);
+    return f >= 2 && g >= 2 ? "" : "a failure is not told:\n" + remains.err;
+}
+
 // A text that another thread lengthens between the two passes over a format.
 void lengthenedText() {
     configure("rootCategory=INFO,A\n" + failing("A", "log"));
@@ -93,6 +110,7 @@ std::string checkLengthened(const Remains& remains) {
 
 const Register registered{
     {"reports-nobody-takes", &nobodyTakesThem, &checkNobody},
+    {"reports-into-each-other", &intoEachOther, &checkIntoEachOther},
     {"reports-of-two", &twoFail, &checkTwoFail},
     {"reports-across-channels", &acrossTwoChannels, &checkAcross},
     {"text-lengthened", &lengthenedText, &checkLengthened},

@@ -54,6 +54,24 @@ std::string checkEither(const Remains& remains) {
                : "the file holds neither value";
 }
 
+// While it holds the store's lock a put logs; a fork takes the locks of both.
+void forkBesideLoggingPut() {
+    configure("rootCategory=DEBUG,A\nappender.A=File\nappender.A.fileName=log\n");
+    useFile();
+    Parallel threads{[] { put("a", "1", true); }};
+    inForkedChild([] {
+        RecordFileManager::instance()->setDBFile(Pathname("child"));
+        put("b", "2", true);
+    });
+    threads.join();
+}
+
+std::string checkLoggingPut(const Remains& remains) {
+    const std::string line = "Writing record file to disk.";
+    if (remains.file("data") != recordFile({{"a", "1"}})) return "the file is damaged";
+    return compare("the log", Remains::lines(remains.file("log")), {line, line});
+}
+
 // The child has what its parent had put, and a file of its own.
 void forkBesidePut() {
     useFile();
@@ -148,6 +166,7 @@ std::string checkRemove(const Remains& remains) {
 const Register registered{
     {"put-beside-put", &putBesidePut, &checkBoth},
     {"put-the-same", &putTheSame, &checkEither},
+    {"fork-beside-logging-put", &forkBesideLoggingPut, &checkLoggingPut},
     {"fork-beside-put", &forkBesidePut, &checkForked},
     {"exit-in-child-of-put", &exitInChildOfPut, &checkForkedExit},
     {"exit-in-child-of-remove", &exitInChildOfRemove, &checkForkedExit},
