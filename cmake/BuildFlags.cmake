@@ -3,6 +3,8 @@
 add_library(korvex_warnings INTERFACE)
 target_compile_options(korvex_warnings INTERFACE
   -Wall -Wextra -Wpedantic -Wconversion -Wshadow -Wformat-security
+  # A program's choice for its own code (korvex/Export.h), even if it is made for the whole build.
+  -UKORVEX_QUALIFIED_NAMES
   # __FILE__ in assertions reads "src/..." wherever the tree lies.
   "-fmacro-prefix-map=${PROJECT_SOURCE_DIR}/=")
 if(CMAKE_CXX_COMPILER_ID MATCHES Clang)

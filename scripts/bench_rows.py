@@ -1,8 +1,9 @@
 """What is measured, and where: the rows of the benchmarks' table."""
+import os
 import pathlib
 
 ROOT = pathlib.Path(__file__).resolve().parent.parent
-BIN = ROOT / "build/bench/bin"
+BIN = pathlib.Path(os.environ.get("KORVEX_BUILD_DIR", ROOT / "build")) / "bench/bin"
 OUT = ROOT / "docs/benchmarks"
 
 

@@ -17,7 +17,7 @@
 #include <exception>
 #include <string>
 
-inline namespace KORVEX_EXPORT korvex {
+KORVEX_NAMESPACE(korvex) {
 
 // A module's voice: a named front end, usually a file-level static, that writes to the channel of
 // the same name. Cheap to build and to copy.
@@ -128,4 +128,4 @@ class Logger {
     Logger* _next = nullptr;                     // in the list of loggers that wait
 };
 
-}  // namespace korvex
+}  // KORVEX_NAMESPACE(korvex)

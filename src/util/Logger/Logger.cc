@@ -1,5 +1,7 @@
 #include <korvex/util/Logger.h>
 
+#include "base/ErrnoKeeper.h"
+#include "platform/AtFork.h"
 #include "util/Logger/EarlyLoggers.h"
 #include "util/Logger/LoggingLocks.h"
 #include "util/Logger/RootObjects.h"
@@ -47,8 +49,11 @@ bool Logger::isDebugEnabled() const {
 
 namespace {
 
-// Before main(), so that no fork comes first.
-[[maybe_unused]] const bool forkSafe = (LoggingLocks::keepThroughForks(), true);
+// Here and not beside LoggingLocks, because of an archive only those files are linked that somebody
+// needs, and nobody who logs can do without this one.
+KORVEX_FIRST_AT_START_UP void keepLocksThroughForks() {
+    pthread_atfork(&LoggingLocks::takeAll, &LoggingLocks::freeAll, &LoggingLocks::freeAll);
+}
 
 constexpr const char* percent_s = "%s";
 
@@ -70,6 +75,8 @@ constexpr const char* percent_s = "%s";
         LogFormat::do_log(this, LEVEL, text);             \
     }                                                     \
     void Logger::name(const std::exception& e) noexcept { \
+        const ErrnoKeeper keeper;                         \
+        if (isFiltered(LEVEL)) return;                    \
         name(percent_s, e.what());                        \
     }
 

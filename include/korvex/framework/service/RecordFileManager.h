@@ -1,10 +1,9 @@
 #pragma once
 
 #include <korvex/Export.h>
+#include <korvex/XmlNode.h>
 #include <korvex/util/Pathname.h>
 #include <korvex/util/ThreadObj.h>
-
-#include <xmlwrapp/node.h>
 
 #include <cstdint>
 #include <cstdio>
@@ -13,7 +12,7 @@
 #include <utility>
 #include <vector>
 
-inline namespace KORVEX_EXPORT korvex {
+KORVEX_NAMESPACE(korvex) {
 
 // One value on its way into or out of the store. Owns nothing: see RecordFileManager::get.
 struct PersistentHashData {
@@ -61,7 +60,7 @@ class RecordFileManager {
     void setDBFile(Pathname path);
     // Names the file hashDb/data below LoaderInfo's database directory and reads it. The node is
     // not looked at. Throws what readFile() throws.
-    void init(const xml::node& node);
+    void init(const XmlNode& node);
 
     // Stores a copy of the value under the key, replacing the one it had, and saves everything if
     // writeToFile is true. The key "_record-file-version" is refused with a logged error. Throws
@@ -121,4 +120,4 @@ class RecordFileManager {
     std::map<std::string, std::pair<std::uint32_t, void*>> records;  // blocks by malloc
 };
 
-}  // namespace korvex
+}  // KORVEX_NAMESPACE(korvex)

@@ -6,7 +6,6 @@
 #include "framework/service/RecordFileManager/RecordFormat.h"
 #include "framework/service/RecordFileManager/StoreLogger.h"
 #include "framework/service/RecordFileManager/ValueBlock.h"
-#include "util/Logger/LoggingLocks.h"
 
 #include <pthread.h>
 
@@ -51,7 +50,6 @@ RecordFileManager* RecordFileManager::instance() {
 // logging system's locks may be taken under this one, so before a fork this one must come first:
 // what pthread_atfork(3) is told last runs first then.
 void RecordFileManager::keepLockThroughForks() KORVEX_NO_THREAD_SAFETY_ANALYSIS {
-    LoggingLocks::keepThroughForks();
     const auto take = []() KORVEX_NO_THREAD_SAFETY_ANALYSIS { __pInstance->_mutex.NOLOG_lock(); };
     const auto free = []() KORVEX_NO_THREAD_SAFETY_ANALYSIS { __pInstance->_mutex.NOLOG_unlock(); };
     static_cast<void>(pthread_atfork(take, free, free));
