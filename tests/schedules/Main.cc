@@ -12,7 +12,8 @@
 #include "strategies/Course.h"
 #include "strategies/Priorities.h"
 
-// Explores the orders in which threads can go on.
+// Explores the orders in which threads can go on. Prints a line a scenario: how many schedules had 0,
+// 1, 2 ... preemptions, a "+" where there are more of them, and how many were drawn.
 
 namespace schedules {
 
@@ -21,6 +22,7 @@ namespace {
 constexpr const char* kUsage =
     "usage: korvex-schedules [OPTION...] [SCENARIO...]\n"
     "  --list            names the scenarios\n"
+    "  --part K/N        every N-th scenario from the K-th on\n"
     "  --bound N         all schedules with at most N preemptions (2)\n"
     "  --limit N         but at most N of each number of preemptions (100000)\n"
     "  --random N        and N by random priorities (1000)\n"
@@ -37,6 +39,8 @@ struct Options {
     unsigned long seed = 1;
     bool onlySeed = false;
     const char* replay = nullptr;
+    unsigned part = 0;  // from 0
+    unsigned parts = 1;
     std::vector<std::string> names;
 };
 
@@ -71,6 +75,7 @@ bool Exploration::explore() {
         return replay(priorities);
     }
     std::printf("%s:", _scenario.name);
+    std::fflush(stdout);
     const bool well = exploreBounded() && exploreRandom();
     if (well && _scenario.wanted != nullptr) {
         std::printf("\n%s: nothing was found, but \"%s\" should have been\n", _scenario.name,
@@ -88,8 +93,7 @@ bool Exploration::exploreBounded() {
         if (!result.failure.empty()) {
             return tellFailure(result.failure, "--replay '" + toText(result.schedule) + "'");
         }
-        std::printf(" %lu schedules with %u preemptions%s;", result.schedules, n,
-                    result.complete ? "" : " (not all)");
+        std::printf(" %u:%lu%s", n, result.schedules, result.complete ? "" : "+");
         std::fflush(stdout);
         if (!result.complete) break;
     }
@@ -118,7 +122,7 @@ bool Exploration::exploreRandom() {
         return tellFailure(failure, "--only-seed " + std::to_string(_options.seed + n) +
                                         " --depth " + std::to_string(_options.depth));
     }
-    std::printf(" %lu by random priorities", _options.random);
+    std::printf(" random:%lu", _options.random);
     return true;
 }
 
@@ -140,14 +144,28 @@ bool Exploration::replay(Strategy& strategy) {
 }
 
 unsigned long number(const char* text) {
-    return text != nullptr ? std::strtoul(text, nullptr, 10) : 0;
+    return std::strtoul(text, nullptr, 10);
+}
+
+[[noreturn]] void giveUp() {
+    std::fputs(kUsage, stderr);
+    std::exit(2);
+}
+
+[[noreturn]] void list() {
+    for (const Scenario& scenario : scenarios())
+        std::printf("%s\n", scenario.name);
+    std::exit(0);
 }
 
 Options read(int argc, char** argv) {
     Options options;
     for (int i = 1; i < argc; ++i) {
         const std::string word = argv[i];
-        const auto value = [&] { return i + 1 < argc ? argv[++i] : nullptr; };
+        const auto value = [&] {
+            if (++i == argc) giveUp();
+            return argv[i];
+        };
         if (word == "--bound") {
             options.bound = static_cast<unsigned>(number(value()));
         } else if (word == "--limit") {
@@ -161,13 +179,13 @@ Options read(int argc, char** argv) {
             options.seed = number(value());
         } else if (word == "--replay") {
             options.replay = value();
+        } else if (word == "--part") {
+            if (std::sscanf(value(), "%u/%u", &options.part, &options.parts) != 2) giveUp();
+            --options.part;
         } else if (word == "--list") {
-            for (const Scenario& scenario : scenarios())
-                std::printf("%s\n", scenario.name);
-            std::exit(0);
+            list();
         } else if (word[0] == '-') {
-            std::fputs(kUsage, stderr);
-            std::exit(2);
+            giveUp();
         } else {
             options.names.push_back(word);
         }
@@ -188,13 +206,14 @@ int exploreAll(const Options& options) {
         return std::strcmp(a.name, b.name) < 0;
     });
     unsigned tried = 0;
+    unsigned number = 0;
     bool well = true;
     for (const Scenario& scenario : scenarios()) {
-        if (!isWanted(options, scenario)) continue;
+        if (!isWanted(options, scenario) || number++ % options.parts != options.part) continue;
         ++tried;
         well = Exploration(runner, scenario, options).explore() && well;
     }
-    if (tried < options.names.size() || tried == 0) {
+    if (tried < options.names.size() && options.parts == 1) {
         std::fprintf(stderr, "korvex-schedules: no such scenario\n");
         return 2;
     }

@@ -8,5 +8,5 @@ set(KORVEX_SCHEDULED_CALLS
   __cxa_guard_acquire __cxa_guard_release __cxa_guard_abort
   pthread_atfork fork waitpid exit
   write open rename unlink stat access close fopen fwrite fclose
-  gettimeofday localtime_r strftime vsnprintf calloc free
+  gettimeofday localtime_r strftime __xpg_strerror_r vsnprintf calloc free
   memcpy memmove memset)

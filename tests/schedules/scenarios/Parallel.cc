@@ -34,6 +34,14 @@ void Parallel::join() {
     _started.clear();
 }
 
+void waitUntil(const std::atomic<bool>& flag) {
+    Operation operation{"see it true", &flag, Operation::READS};
+    operation.argument = const_cast<std::atomic<bool>*>(&flag);
+    operation.ready = [](void* f) { return *static_cast<volatile const bool*>(f); };
+    Scheduler::instance().point(operation);
+    require(flag, "it is no longer true");
+}
+
 void waitForTheOthers() {
     Operation operation{"see the others end", nullptr};
     operation.ready = [](void*) { return Scheduler::instance().alone(); };

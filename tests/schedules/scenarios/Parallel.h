@@ -2,6 +2,7 @@
 
 #include <pthread.h>
 
+#include <atomic>
 #include <functional>
 #include <initializer_list>
 #include <memory>
@@ -28,6 +29,9 @@ class Parallel {
     };
     std::vector<Started> _started;
 };
+
+// Waits until it is true.
+void waitUntil(const std::atomic<bool>& flag);
 
 // Waits until no other thread is left, detached ones included.
 void waitForTheOthers();
