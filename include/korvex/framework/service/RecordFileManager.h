@@ -113,8 +113,6 @@ class RecordFileManager {
 
     RecordFileManager();
 
-    static void keepLockThroughForks();
-
     void load(const Pathname& file, const std::string& prefix, std::string& version);
 
     static RecordFileManager* __pInstance;

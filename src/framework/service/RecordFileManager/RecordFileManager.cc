@@ -53,24 +53,34 @@ void appendCopy(std::vector<PersistentFullData>& list, RecordView record) {
 
 RecordFileManager::RecordFileManager() : _state(new State) {}
 
-RecordFileManager* RecordFileManager::instance() {
-    if (__pInstance == nullptr) __pInstance = new RecordFileManager;
-    return __pInstance;
+namespace {
+
+// A child of fork(2) would find the store's lock as another thread held it, and nobody to free it.
+// The logging system's locks may be taken under this one, so before a fork this one comes first.
+Mutex* storeLock = nullptr;  // null: there is no store yet
+thread_local bool takenForFork = false;
+
+void takeStoreLock() KORVEX_NO_THREAD_SAFETY_ANALYSIS {
+    takenForFork = storeLock != nullptr && storeLock->NOLOG_lock();
 }
 
-// A child of fork(2) would find the lock as another thread held it, and nobody to free it. The
-// logging system's locks may be taken under this one, so before a fork this one comes first.
-KORVEX_SECOND_AT_START_UP void RecordFileManager::keepLockThroughForks()
-    KORVEX_NO_THREAD_SAFETY_ANALYSIS {
-    static thread_local bool taken = false;  // there may be no store yet
-    const auto take = []() KORVEX_NO_THREAD_SAFETY_ANALYSIS {
-        taken = __pInstance != nullptr && __pInstance->_mutex.NOLOG_lock();
-    };
-    const auto giveBack = []() KORVEX_NO_THREAD_SAFETY_ANALYSIS {
-        if (taken) __pInstance->_mutex.NOLOG_unlock();
-        taken = false;
-    };
-    static_cast<void>(pthread_atfork(take, giveBack, giveBack));
+void freeStoreLock() KORVEX_NO_THREAD_SAFETY_ANALYSIS {
+    if (takenForFork) storeLock->NOLOG_unlock();
+    takenForFork = false;
+}
+
+KORVEX_SECOND_AT_START_UP void keepStoreLockThroughForks() {
+    pthread_atfork(&takeStoreLock, &freeStoreLock, &freeStoreLock);
+}
+
+}  // namespace
+
+RecordFileManager* RecordFileManager::instance() {
+    if (__pInstance == nullptr) {
+        __pInstance = new RecordFileManager;
+        storeLock = &__pInstance->_mutex;
+    }
+    return __pInstance;
 }
 
 RecordFileManager::~RecordFileManager() noexcept(false) = default;
