@@ -56,12 +56,13 @@ class Exploration {
     bool exploreBounded();
     bool exploreRandom();
     bool replay(Strategy& strategy);
-    bool tellFailure(const std::string& failure, const std::string& again);
+    bool tellFailure(const std::string& failure, bool mayBeWanted, const std::string& again);
     unsigned usualSteps();
 
     Runner& _runner;
     const Scenario& _scenario;
     const Options& _options;
+    bool _found = false;  // what was wanted
 };
 
 bool Exploration::explore() {
@@ -83,7 +84,7 @@ bool Exploration::explore() {
         return false;
     }
     std::printf("\n");
-    return well || _scenario.wanted != nullptr;
+    return well || _found;
 }
 
 bool Exploration::exploreBounded() {
@@ -91,7 +92,8 @@ bool Exploration::exploreBounded() {
     for (unsigned n = 0; n <= _options.bound; ++n) {
         const Bounded::Result result = bounded.explore(n, _options.limit);
         if (!result.failure.empty()) {
-            return tellFailure(result.failure, "--replay '" + toText(result.schedule) + "'");
+            std::printf(" %u:%lu", n, result.schedules + 1);
+            return tellFailure(result.failure, n >= _scenario.wantedFrom, "--replay '" + toText(result.schedule) + "'");
         }
         std::printf(" %u:%lu%s", n, result.schedules, result.complete ? "" : "+");
         std::fflush(stdout);
@@ -119,16 +121,20 @@ bool Exploration::exploreRandom() {
         Priorities priorities(_options.seed + n, _options.depth, steps);
         const std::string failure = _runner.run(_scenario, priorities);
         if (failure.empty()) continue;
-        return tellFailure(failure, "--only-seed " + std::to_string(_options.seed + n) +
+        std::printf(" random:%lu", n + 1);
+        return tellFailure(failure, true, "--only-seed " + std::to_string(_options.seed + n) +
                                         " --depth " + std::to_string(_options.depth));
     }
     std::printf(" random:%lu", _options.random);
     return true;
 }
 
-bool Exploration::tellFailure(const std::string& failure, const std::string& again) {
-    if (_scenario.wanted != nullptr && failure.find(_scenario.wanted) != std::string::npos) {
+bool Exploration::tellFailure(const std::string& failure, bool mayBeWanted,
+                              const std::string& again) {
+    mayBeWanted = mayBeWanted && _scenario.wanted != nullptr;
+    if (mayBeWanted && failure.find(_scenario.wanted) != std::string::npos) {
         std::printf(" found, as it should be: %s", failure.c_str());
+        _found = true;
         return false;
     }
     std::printf(" FAILED: %s\n%s  again: korvex-schedules %s %s", failure.c_str(),

@@ -26,6 +26,7 @@ struct Scenario {
     std::string (*check)(const Remains& remains) = nullptr;
     // For scenarios that are there to be found wanting: a part of what must be said of one.
     const char* wanted = nullptr;
+    unsigned wantedFrom = 0;  // preemptions; with fewer all must go well
 };
 
 std::vector<Scenario>& scenarios();

@@ -1,10 +1,13 @@
 #include <korvex/util/Logger.h>
 
-#include <memory>
+#include <pthread.h>
+
+#include <string>
 
 #include "points/Process.h"
 #include "scenarios/Logging.h"
 #include "scenarios/Parallel.h"
+#include "scenarios/Workers.h"
 
 // Forks while other threads log. The child has none of them, and everything as they left it.
 
@@ -157,7 +160,54 @@ std::string checkHandler(const Remains& remains) {
                    {"2026 prepare", "2026 parent", "2026 child", "2026 other"});
 }
 
+// One that was registered later takes a lock of its own under which other threads log.
+Mutex& handlersLock() {
+    static Mutex& mutex = *new Mutex;
+    return mutex;
+}
+
+void handlerLocks() {
+    configure("rootCategory=INFO,A\nappender.A=File\nappender.A.fileName=log\n");
+    Logger logger("test");
+    handlersLogger = &logger;
+    pthread_atfork(
+        [] {
+            handlersLock().NOLOG_lock();
+            handlersLogger->info(std::string("prepare"));
+        },
+        [] { handlersLock().NOLOG_unlock(); },
+        [] {
+            handlersLogger->info(std::string("child"));
+            handlersLock().NOLOG_unlock();
+        });
+    Parallel threads{[&] {
+        const ScopedMutex lock(handlersLock());
+        logger.info(std::string("other"));
+    }};
+    inForkedChild([&] { const ScopedMutex lock(handlersLock()); });
+    threads.join();
+}
+
+std::string checkHandlerLocks(const Remains& remains) {
+    return compare("the log", Remains::lines(remains.file("log")), {"prepare", "child", "other"});
+}
+
+// The child may build threads of its own, whatever those of its parent were doing.
+void besideThreads() {
+    const Thread mainThread;
+    const auto live = [] {
+        Worker worker("worker", [] {});
+        worker.go();
+        worker.join();
+    };
+    Parallel threads{live};
+    inForkedChild(live);
+    threads.join();
+}
+
 const Register registered{
+    {"fork-beside-threads", &besideThreads},
+    {"fork-handler-locks", &handlerLocks, &checkHandlerLocks},
     {"fork-with-dates", &withDates, &checkDates},
     {"fork-printf", &printf, &checkPrintf},
     {"fork-beside-initialize", &besideInitialize, &checkStderr},

@@ -88,7 +88,7 @@ const Register registered{
     {"gate-opened", &opened},
     {"gate-two-opened", &twoOpened},
     {"gate-abandoned", &abandoned},
-    {"known-gate-opened-and-abandoned", &openedAndAbandoned, nullptr, "data race"},
+    {"known-gate-opened-and-abandoned", &openedAndAbandoned, nullptr, "data race", 1},
     {"gate-joined-by-another", &joinedByAnother},
 };
 
