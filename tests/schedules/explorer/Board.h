@@ -7,7 +7,7 @@ namespace schedules {
 // What a run tells the explorer, in memory that both see. A run is a process of its own, and so may
 // be a child that it forks; each writes here while the others wait.
 
-constexpr unsigned kMaxThreads = 8;
+constexpr unsigned kMaxThreads = 6;
 constexpr unsigned kMaxSteps = 20000;  // announced operations of one run
 constexpr unsigned kMaxShared = 4096;
 

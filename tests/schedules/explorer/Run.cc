@@ -41,7 +41,10 @@ void catchBadAccesses() {
 
 }  // namespace
 
-Runner::Runner() : _dir("/tmp/korvex-schedules-XXXXXX") {
+// In memory where there is such a place, for there are many small files.
+Runner::Runner()
+    : _dir((access("/dev/shm", W_OK) == 0 ? "/dev/shm" : "/tmp") +
+           std::string("/korvex-schedules-XXXXXX")) {
     void* const memory = mmap(nullptr, sizeof(Board), PROT_READ | PROT_WRITE,
                               MAP_SHARED | MAP_ANONYMOUS, -1, 0);
     if (memory == MAP_FAILED || mkdtemp(_dir.data()) == nullptr) {
