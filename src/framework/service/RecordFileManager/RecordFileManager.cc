@@ -69,7 +69,7 @@ void freeStoreLock() KORVEX_NO_THREAD_SAFETY_ANALYSIS {
     takenForFork = false;
 }
 
-KORVEX_SECOND_AT_START_UP void keepStoreLockThroughForks() {
+KORVEX_REGISTERS_STORE_LOCK void keepStoreLockThroughForks() {
     pthread_atfork(&takeStoreLock, &freeStoreLock, &freeStoreLock);
 }
 
