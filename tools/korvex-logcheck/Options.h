@@ -4,12 +4,19 @@
 
 #include <optional>
 #include <string>
+#include <vector>
 
 // The command line, taken apart.
 struct Options {
-    Pathname file;
-    Pathname home;  // empty: "${KORVEX_HOME}" stays as written
+    // What is written to standard output. FINDINGS: nothing but those.
+    enum Mode { REPORT, FINDINGS, JSON, FIX, CODES };
+
+    Mode mode = REPORT;
+    std::vector<std::string> files;  // "-" is standard input; with CODES there are none
+    Pathname home;                   // empty: "${KORVEX_HOME}" stays as written
     std::optional<std::string> channel;
+    bool paths = false;
+    std::optional<std::string> user;  // who is to write the log files
 };
 
 // Throws Failure. --help and --version end the process.

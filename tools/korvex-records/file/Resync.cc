@@ -4,6 +4,8 @@
 #include <optional>
 #include <string>
 
+#include "text/Utf8.h"
+
 namespace {
 
 constexpr unsigned kEnough = 3;              // records that follow on each other
@@ -91,12 +93,13 @@ class Search {
         return followOn(place, before, static_cast<unsigned>(-1));
     }
 
-    // Some of them are enough, unless keys might be values and values keys: from the next length
-    // on, they follow on as well.
-    bool isLikely(std::uint64_t place, const Key& before) const {
-        if (!followOn(place, before, kEnough)) return false;
+    // Some of them are enough if a record leaves a trace that begins at `begin`. Should they follow
+    // on from the next length as well, so that keys might be values and values keys, its key must
+    // be text.
+    bool isLikely(std::uint64_t begin, std::uint64_t place, const Key& before) const {
+        if (!tracesTo(begin, place, before) || !followOn(place, before, kEnough)) return false;
         const std::uint64_t nextLength = place + 4 + _file.numberAt(place);
-        return !followOn(nextLength, before, kEnough);
+        return !followOn(nextLength, before, kEnough) || tracesTo(begin, place, before, true);
     }
 
     bool wasRead(std::uint64_t place) const {
@@ -123,7 +126,9 @@ class Search {
             const Key key = orderOf(frame);
             for (std::uint64_t place = frame.begin + 8; place < frame.end(); ++place) {
                 if (!tracesTo(frame.begin, place, formerKey)) continue;
-                if (!leadsToEnd(place, formerKey) && !isLikely(place, formerKey)) continue;
+                if (!leadsToEnd(place, formerKey) && !isLikely(frame.begin, place, formerKey)) {
+                    continue;
+                }
                 result.next = place;
                 result.kept = i;
                 result.isExact = true;
@@ -138,7 +143,7 @@ class Search {
         for (std::uint64_t place = _at + 1; place < _file.size(); ++place)
             if (leadsToEnd(place, _lastKey)) return better(place);
         for (std::uint64_t place = _at + 8; place < _file.size(); ++place)
-            if (tracesTo(_at, place, _lastKey) && isLikely(place, _lastKey)) return place;
+            if (isLikely(_at, place, _lastKey)) return place;
         return _file.size();
     }
 
@@ -159,21 +164,25 @@ class Search {
 
     // Whether a record from `begin` to `end` has one length that is right, so that only the other
     // one is damaged.
-    bool tracesTo(std::uint64_t begin, std::uint64_t end, const Key& before) const {
-        return end - begin >= 8 && (hasKeyLengthDamaged(begin, end, before) ||
-                                    hasValueLengthDamaged(begin, end, before));
+    bool tracesTo(std::uint64_t begin, std::uint64_t end, const Key& before,
+                  bool textOnly = false) const {
+        return end - begin >= 8 && (hasKeyLengthDamaged(begin, end, before, textOnly) ||
+                                    hasValueLengthDamaged(begin, end, before, textOnly));
     }
 
-    bool mayCome(std::uint64_t begin, std::uint64_t keySize, const Key& before) const {
+    bool mayCome(std::uint64_t begin, std::uint64_t keySize, const Key& before,
+                 bool textOnly) const {
         const std::string key(_file.at(begin + 4, keySize));
-        return isVersion(begin, key) || (!isRefusedKey(key) && (!before || key > *before));
+        if (isVersion(begin, key)) return true;
+        return !isRefusedKey(key) && (!before || key > *before) && (!textOnly || isUtf8(key));
     }
 
-    bool hasKeyLengthDamaged(std::uint64_t begin, std::uint64_t end, const Key& before) const {
+    bool hasKeyLengthDamaged(std::uint64_t begin, std::uint64_t end, const Key& before,
+                             bool textOnly) const {
         const std::uint64_t last = std::min(end - 4, begin + kLongKey);
         for (std::uint64_t length = begin + 4; length <= last; ++length) {
             if (_file.numberAt(length) == end - length - 4 &&
-                mayCome(begin, length - begin - 4, before)) {
+                mayCome(begin, length - begin - 4, before, textOnly)) {
                 return true;
             }
         }
@@ -181,12 +190,13 @@ class Search {
     }
 
     // One byte of it, since it tells no more than that.
-    bool hasValueLengthDamaged(std::uint64_t begin, std::uint64_t end, const Key& before) const {
+    bool hasValueLengthDamaged(std::uint64_t begin, std::uint64_t end, const Key& before,
+                               bool textOnly) const {
         const std::uint32_t keySize = _file.numberAt(begin);
         if (end - begin - 8 < keySize) return false;
         const std::uint64_t size = end - begin - 8 - keySize;
         return differingBytes(_file.numberAt(begin + 4 + keySize), size) <= 1 &&
-               mayCome(begin, keySize, before);
+               mayCome(begin, keySize, before, textOnly);
     }
 
     // Whether what stands at the fault looks as a record does at its beginning.
@@ -199,7 +209,7 @@ class Search {
         const std::uint32_t keySize = _file.numberAt(_at);
         const std::uint64_t there = std::min<std::uint64_t>(keySize, left - 4);
         if (keySize >= kLongKey) return false;
-        return there < keySize || mayCome(_at, keySize, _lastKey);
+        return there < keySize || mayCome(_at, keySize, _lastKey, false);
     }
 
     // A length that shrank by the loss of one bit: with it the last record would reach the next.

@@ -2,6 +2,7 @@
 
 #include <langinfo.h>
 #include <locale.h>
+#include <unistd.h>
 #include <wchar.h>
 #include <wctype.h>
 
@@ -38,10 +39,17 @@ bool isPrintable(char32_t c, locale_t locale) {
     return !isInvisible(c) && iswprint_l(static_cast<wint_t>(c), locale) != 0;
 }
 
+// Asked once, because there may be a million keys.
+locale_t localeOf(int fd) {
+    static const locale_t kOut = isTerminal(STDOUT_FILENO) ? utf8Locale() : nullptr;
+    static const locale_t kErr = isTerminal(STDERR_FILENO) ? utf8Locale() : nullptr;
+    return fd == STDOUT_FILENO ? kOut : kErr;
+}
+
 }  // namespace
 
 std::string shownKey(std::string_view key, int fd) {
-    const locale_t locale = isTerminal(fd) ? utf8Locale() : nullptr;
+    const locale_t locale = localeOf(fd);
     if (locale == nullptr) return escaped(key);
     std::string shown;
     while (!key.empty()) {

@@ -3,7 +3,7 @@
 #include <string>
 #include <string_view>
 
-// A key for whoever looks at descriptor fd: escaped, except that a UTF-8 terminal gets characters
+// A key for whoever looks at standard output or standard error (fd): escaped, except that a UTF-8 terminal gets characters
 // that it can print as they are.
 std::string shownKey(std::string_view key, int fd);
 
