@@ -94,7 +94,7 @@ header() {
     {
         in_comment = 0
         # Inline, each class would appear twice; told once, it lists the functions and levels.
-        if (sub(/^inline namespace/, "namespace") && FILENAME ~ /LoaderInfo/) {
+        if (sub(/^KORVEX_NAMESPACE\(korvex\)/, "namespace korvex") && FILENAME ~ /LoaderInfo/) {
             print "/// All of Korvex. The namespace is inline: names work with and without it."
         }
         sub(/ +\/\/ NOLINT.*/, "")

@@ -9,7 +9,7 @@
 #include "util/Logger/AppenderRegistry.h"
 #include "util/Logger/ChannelRegistry.h"
 #include "util/Logger/ConfigReader.h"
-#include "util/Logger/NologLock.h"
+#include "util/Logger/LoggingLock.h"
 
 namespace {
 
@@ -17,7 +17,7 @@ namespace {
 void reset() {
     {
         ChannelRegistry& registry = ChannelRegistry::instance();
-        const NologLock lock(registry.mutex);
+        const LoggingLock lock(registry.mutex);
         registry.channels.clear();
     }
     appenders().clear();

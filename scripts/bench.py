@@ -23,7 +23,7 @@ from bench_rows import BIN, COUNTED, LINEAR, OUT, ROOT, ROWS, contestants, start
 UNSUPPORTED = 3  # exit status of a contestant that cannot do a row
 GROWN = 4 / 3
 SHM = pathlib.Path("/dev/shm")
-work = ROOT / "build/bench/work"
+work = BIN.parent / "work"
 
 
 def say(text):

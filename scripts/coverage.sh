@@ -4,7 +4,7 @@
 set -eu
 cd "$(dirname "$0")/.."
 jobs=${1:-2}
-build=$PWD/build/coverage
+build=${KORVEX_BUILD_DIR:-$PWD/build}/coverage
 
 flags="-O0 -g0 -fprofile-instr-generate -fcoverage-mapping -fprofile-update=atomic"
 suffix=-19

@@ -1,7 +1,7 @@
 # shellcheck shell=bash
 # Clean Debian roots, for scripts to source. Needs root and debootstrap.
 
-debian_base=$PWD/build/portability/base
+debian_base=${KORVEX_BUILD_DIR:-$PWD/build}/portability/base
 
 # inside ROOT COMMAND...: in that root, with mounts that vanish with the command.
 inside() {

@@ -5,12 +5,13 @@ set -eu
 cd "$(dirname "$0")/.."
 tests/docs/pages.sh .
 tests/docs/messages.sh .
-rm -rf build/docs
-mkdir -p build/docs
-doxygen docs/Doxyfile
+build=${KORVEX_BUILD_DIR:-$PWD/build}
+rm -rf "$build/docs"
+mkdir -p "$build/docs"
+{ cat docs/Doxyfile && echo "OUTPUT_DIRECTORY = \"$build/docs\""; } | doxygen -
 
 # Doxygen does not say so when a link of a page leads nowhere.
-cd build/docs/html
+cd "$build/docs/html"
 for page in index.html md_*.html; do
     grep -o 'href="[^":]*"' "$page" | sed 's/^href="//; s/"$//' | sort -u | while IFS= read -r target; do
         file=${target%%#*}
@@ -18,5 +19,4 @@ for page in index.html md_*.html; do
     done
 done > ../dead-links
 [ ! -s ../dead-links ] || { cat ../dead-links; exit 1; }
-cd ../../..
-echo "$PWD/build/docs/html/index.html"
+echo "$PWD/index.html"

@@ -5,11 +5,13 @@
 set -euo pipefail
 cd "$(dirname "$0")/.."
 . scripts/debian-root.sh
-here=$PWD/build/package-test
+. scripts/dev/source-files.sh
+build=${KORVEX_BUILD_DIR:-$PWD/build}
+here=$build/package-test
 log=$here/log
 mkdir -p "$here"
 : > "$log"
-version=$(sed -n 's/^Version: //p' build/package/korvex.pc)
+version=$(sed -n 's/^Version: //p' "$build/package/korvex.pc")
 abi=libkorvex${version%%.*}
 trap '[ $? -eq 0 ] || { tail -n 30 "$log"; echo "package-test: FAILED; the log is $log"; }' EXIT
 
@@ -21,7 +23,7 @@ root_with() {
     shift
     new_root "$root"
     mkdir "$root/packages"
-    cp build/package/packages/*.deb "$root/packages/"
+    cp "$build"/package/packages/*.deb "$root/packages/"
     local wanted=()
     for package in "$@"; do
         case $package in
@@ -110,7 +112,7 @@ wants() {
 test_tools
 root_with development "$abi" libkorvex-dev korvex-doc g++ cmake ninja-build
 mkdir "$here/development/korvex"
-git ls-files -z | tar -c --null -T - | tar -x -C "$here/development/korvex"
+source_files | tar -c --null -T - | tar -x -C "$here/development/korvex"
 use_all "no xmlwrapp"
 build_examples
 inside "$here/development" /korvex/tests/checks/exports.sh "/usr/lib/$(uname -m)-linux-gnu/libkorvex.so"

@@ -3,8 +3,9 @@
 # compares the record files that they write. Needs root. Usage: portability.sh [MACHINE...]
 set -euo pipefail
 . scripts/debian-root.sh
+. scripts/dev/source-files.sh
 
-here=$PWD/build/portability
+here=${KORVEX_BUILD_DIR:-$PWD/build}/portability
 machines=(i386 i386-time64 libc++ arm64 s390x)
 [ $# -eq 0 ] || machines=("$@")
 
@@ -50,7 +51,7 @@ build() {
     root=$(root_of "$machine")
     describe "$machine"
     mkdir -p "$here/$root/korvex"
-    git ls-files -z | tar -c --null -T - | tar -x -C "$here/$root/korvex"
+    source_files | tar -c --null -T - | tar -x -C "$here/$root/korvex"
     inside "$here/$root" sh -euc '
         machine=$1 cc=$2 flags=$3 archdir=$4 emulator=$5
         export PKG_CONFIG_LIBDIR=/usr/lib/$archdir/pkgconfig:/usr/share/pkgconfig
@@ -117,7 +118,7 @@ failed=0
 for machine in "${machines[@]}"; do
     make_root "$(root_of "$machine")"
     if ! build "$machine"; then
-        echo "$machine: does not build, see build/portability/$machine-build.log"
+        echo "$machine: does not build, see $here/$machine-build.log"
         failed=1
         continue
     fi

@@ -1,4 +1,4 @@
-#include <xmlwrapp/node.h>
+#include <korvex-compat/XmlNode.h>
 
 #include <libxml/tree.h>
 

@@ -16,14 +16,16 @@ int formatInto(char* buf, std::size_t size, const char* fmt, va_list ap) {
 
 }  // namespace
 
-// C99's vsnprintf tells the length that is needed, so one retry is enough; a negative result is a
+// C99's vsnprintf tells the length that is needed, so one retry is enough as long as no other
+// thread makes a text longer between the two; then it takes one more. A negative result is a
 // conversion that no buffer can cure.
 PrintfBuffer::PrintfBuffer(const char* fmt, va_list ap) {
-    int length = formatInto(_local, sizeof _local, fmt, ap);
-    if (length >= static_cast<int>(sizeof _local)) {
-        const std::size_t needed = static_cast<std::size_t>(length) + 1;
-        _heap.reset(new char[needed]);
-        length = formatInto(_heap.get(), needed, fmt, ap);
+    std::size_t size = sizeof _local;
+    int length = formatInto(_local, size, fmt, ap);
+    while (length >= 0 && static_cast<std::size_t>(length) >= size) {
+        size = static_cast<std::size_t>(length) + 1;
+        _heap.reset(new char[size]);
+        length = formatInto(_heap.get(), size, fmt, ap);
     }
     _ok = length >= 0;
     _size = _ok ? static_cast<std::size_t>(length) : 0;

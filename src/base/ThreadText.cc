@@ -12,14 +12,23 @@ void ThreadText::dropTexts(void* dropped) {
     delete static_cast<Texts*>(dropped);
 }
 
+namespace {
+
+pthread_key_t key;
+
+}  // namespace
+
+bool ThreadText::makeKey() noexcept {
+    static const bool haveKey = pthread_key_create(&key, dropTexts) == 0;
+    return haveKey;
+}
+
 // A thread's key, not a thread_local object, tells when the thread ends: registering one of those
 // may end the process for want of memory.
 ThreadText::Texts* ThreadText::makeTexts() noexcept {
     if (_nothingKept) return nullptr;
     _nothingKept = true;  // until all has gone well
-    static pthread_key_t key;
-    static const bool haveKey = pthread_key_create(&key, dropTexts) == 0;
-    Texts* const made = haveKey ? new (std::nothrow) Texts : nullptr;
+    Texts* const made = makeKey() ? new (std::nothrow) Texts : nullptr;
     if (made == nullptr) return nullptr;
     if (pthread_setspecific(key, made) != 0) {
         delete made;

@@ -21,6 +21,9 @@ class ThreadText {
 
     std::string& operator*() { return _kept != nullptr ? *_kept : _own; }
 
+    // Makes what all threads share, if it is not there yet.
+    static bool makeKey() noexcept;
+
   private:
     static constexpr int kTexts = 4;  // a message and its line, and those of a report
 

@@ -1,12 +1,26 @@
 #pragma once
 
+#include <korvex/Export.h>
+
 #include <pthread.h>
+
+#include <ctime>
 
 inline namespace korvex {
 
-// Waits on a condition with default attributes for at most `seconds` from now, by a clock that
-// nobody sets where the platform can. 0 when woken, ETIMEDOUT when the time is over, else the
-// error.
-int condTimedWait(pthread_cond_t* cond, pthread_mutex_t* mutex, unsigned int seconds);
+// A moment some seconds from now, by a clock that nobody sets where the platform can wait by one.
+class KORVEX_HIDDEN Deadline {
+  public:
+    explicit Deadline(unsigned int seconds);
+
+    const struct timespec& moment() const { return _moment; }
+
+  private:
+    struct timespec _moment {};
+};
+
+// Waits on a condition with default attributes until the deadline at the latest. 0 when woken,
+// ETIMEDOUT when the time is over, else the error.
+int condTimedWait(pthread_cond_t* cond, pthread_mutex_t* mutex, const Deadline& deadline);
 
 }  // namespace korvex

@@ -1,5 +1,7 @@
 #include "platform/ErrorText.h"
 
+#include "platform/LibcLock.h"
+
 #include <cstring>
 
 #ifdef __GLIBC__
@@ -14,6 +16,8 @@ extern "C" int __xpg_strerror_r(int errnum, char* buf, size_t size);
 inline namespace korvex {
 
 bool errorText(int errnum, char* buf, std::size_t size) {
+    if (LibcLock::isInside()) return false;  // not even the C library could tell it there
+    const LibcLock lock;
     return KORVEX_STRERROR_R(errnum, buf, size) == 0;
 }
 

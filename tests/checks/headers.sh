@@ -1,6 +1,6 @@
 #!/bin/sh
-# Checks that every public header compiles alone, without a warning, also in a program whose macros
-# have the levels' names, and that none brings along a header that costs its includer much.
+# Checks that every public header compiles alone, without a warning, also with the namespace as an
+# ordinary one and in a program whose macros have the levels' names, and that none brings along a header that costs its includer much.
 # Usage: headers.sh SOURCE-DIR CXX
 set -eu
 cd "$1"
@@ -8,7 +8,7 @@ flags="-std=c++17 -fsyntax-only -Wall -Wextra -Wpedantic -Wconversion -Wshadow -
     -Iinclude -Icompat/xmlwrapp/include $(pkg-config --cflags xmlwrapp 2> /dev/null || true)"
 count=0
 for header in $(find include -name '*.h' | sort); do
-    for macros in "" "-DDEBUG -DINFO=1 -DNOTICE -DWARN -DERROR=2 -DCRIT -DALERT -DFATAL -DEMERG"; do
+    for macros in "" -DKORVEX_QUALIFIED_NAMES "-DDEBUG -DINFO=1 -DNOTICE -DWARN -DERROR=2 -DCRIT -DALERT -DFATAL -DEMERG"; do
         # shellcheck disable=SC2086  # lists of flags
         printf '#include <%s>\n#include <%s>\nint main() {}\n' "${header#include/}" "${header#include/}" |
             "$2" $flags $macros -x c++ -

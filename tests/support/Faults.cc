@@ -37,7 +37,10 @@ struct Plan {
     std::atomic<bool> persistent{false};
     std::atomic<int> error{0};  // 0 with failAt set: a short count instead of a failure
     std::atomic<unsigned long> limit{kUnlimited};
+    std::atomic<int> errorBehind{0};  // of the call after a short one
     std::atomic<long long> shift{0};
+    std::atomic<unsigned> dwell{0};  // microseconds that each call takes longer
+    std::atomic<int> inside{0};      // threads in the call just now
 };
 
 Plan plans[static_cast<std::size_t>(Call::COUNT)];
@@ -57,10 +60,31 @@ Verdict judge(Call call) {
     if (!plan.active) return {};
     const unsigned long nth = ++plan.calls;
     const unsigned long at = plan.failAt;
+    if (at != kNever && nth == at + 1 && plan.errorBehind != 0) return {plan.errorBehind};
     if (at == kNever || nth < at || (nth > at && !plan.persistent)) return {};
     if (plan.error == kKill) kill(getpid(), SIGKILL);
     return {plan.error, plan.limit, plan.shift};
 }
+
+// Stands in a hook for as long as the call lasts. Looks at nothing that would order threads unless
+// somebody asked for it: the thread sanitizer must see them as they are.
+class Inside {
+  public:
+    explicit Inside(Call call) : _plan(planOf(call)), _counted(_plan.dwell != 0) {
+        if (!_counted) return;
+        ++_plan.inside;
+        usleep(_plan.dwell);
+    }
+    Inside(const Inside&) = delete;
+    Inside& operator=(const Inside&) = delete;
+    ~Inside() {
+        if (_counted) --_plan.inside;
+    }
+
+  private:
+    Plan& _plan;
+    const bool _counted;
+};
 
 bool fails(Call call) {
     const Verdict verdict = judge(call);
@@ -123,11 +147,14 @@ CountCalls::CountCalls(Call call) : _call(call) {
     plan.calls = 0;
     plan.failAt = kNever;
     plan.shift = 0;
+    plan.errorBehind = 0;
+    plan.dwell = 0;
     plan.active = true;
 }
 
 CountCalls::~CountCalls() {
     planOf(_call).active = false;
+    planOf(_call).dwell = 0;
 }
 
 unsigned long CountCalls::count() const {
@@ -162,6 +189,11 @@ ShortNth::ShortNth(Call call, unsigned long k, unsigned long count) : CountCalls
     plan.failAt = k;
 }
 
+ShortNth::ShortNth(Call call, unsigned long k, unsigned long count, int errorBehind)
+    : ShortNth(call, k, count) {
+    planOf(call).errorBehind = errorBehind;
+}
+
 bool ShortNth::fired() const {
     return count() >= planOf(_call).failAt;
 }
@@ -179,10 +211,21 @@ bool ShiftNth::fired() const {
     return count() >= planOf(_call).failAt;
 }
 
+struct timespec deadlines[2] = {};
+
+Dwell::Dwell(Call call, unsigned microseconds) : CountCalls(call) {
+    planOf(call).dwell = microseconds;
+}
+
+int Dwell::inside() const {
+    return planOf(_call).inside;
+}
+
 }  // namespace testsupport
 
 using testsupport::Call;
 using testsupport::fails;
+using testsupport::Inside;
 using testsupport::judge;
 
 // Gives a hook the name under which the linker looks for it.
@@ -193,6 +236,7 @@ using testsupport::judge;
 #define FORWARD(failure, result, name, parameters, arguments) \
     result __real_##name parameters;                          \
     result __wrap_##name parameters {                         \
+        const Inside inside(Call::name);                      \
         if (fails(Call::name)) return failure;                \
         return __real_##name arguments;                       \
     }
@@ -202,6 +246,7 @@ using testsupport::judge;
     result __real_##name parameters REAL(name);                       \
     result __wrap_##name parameters WRAP(name);                       \
     result __wrap_##name parameters {                                 \
+        const Inside inside(Call::name);                              \
         if (fails(Call::name)) return failure;                        \
         return __real_##name arguments;                               \
     }
@@ -210,6 +255,7 @@ using testsupport::judge;
 #define FORWARD_NUMBER(call, name, parameters, arguments)      \
     int __real_##name parameters;                              \
     int __wrap_##name parameters {                             \
+        const Inside inside(call);                             \
         if (const int error = judge(call).error) return error; \
         return __real_##name arguments;                        \
     }
@@ -372,7 +418,11 @@ int __wrap_pthread_cond_clockwait(pthread_cond_t* cond, pthread_mutex_t* mutex, 
                                   const struct timespec* until) WRAP(pthread_cond_clockwait);
 int __wrap_pthread_cond_clockwait(pthread_cond_t* cond, pthread_mutex_t* mutex, clockid_t clock,
                                   const struct timespec* until) {
-    if (const int error = judge(Call::pthread_cond_clockwait).error) return error;
+    const auto verdict = judge(Call::pthread_cond_clockwait);
+    testsupport::deadlines[0] = testsupport::deadlines[1];
+    testsupport::deadlines[1] = *until;
+    if (verdict.error != 0) return verdict.error;
+    if (verdict.limit == 0) return 0;  // woken without cause
     return __real_pthread_cond_clockwait(cond, mutex, clock, until);
 }
 FORWARD_NUMBER(Call::pthread_key_create, pthread_key_create,

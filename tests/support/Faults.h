@@ -1,5 +1,7 @@
 #pragma once
 
+#include <ctime>
+
 namespace testsupport {
 
 // The library's calls that a test can count or make fail. They reach the hooks through the
@@ -84,10 +86,13 @@ class KillAtNth : public CountCalls {
     KillAtNth(Call call, unsigned long k);
 };
 
-// Lets the k-th read, write, fread or fwrite move `count` bytes at the most.
+// Lets the k-th read, write, fread or fwrite move `count` bytes at the most; with 0, the k-th
+// pthread_cond_clockwait return at once as if it had been woken.
 class ShortNth : public CountCalls {
   public:
     ShortNth(Call call, unsigned long k, unsigned long count);
+    // The call after that one fails.
+    ShortNth(Call call, unsigned long k, unsigned long count, int errorBehind);
 
     bool fired() const;
 };
@@ -99,6 +104,17 @@ class ShiftNth : public CountCalls {
     ShiftNth(Call call, unsigned long k, long long by);
 
     bool fired() const;
+};
+
+// Until when the last two calls of pthread_cond_clockwait were to wait.
+extern struct timespec deadlines[2];
+
+// Lets each call take that many microseconds longer, and tells how many threads are in it just now.
+class Dwell : public CountCalls {
+  public:
+    Dwell(Call call, unsigned microseconds);
+
+    int inside() const;
 };
 
 }  // namespace testsupport

@@ -382,6 +382,26 @@ TEST_F(FileDescriptorTest, AssigningTheSameNumberKeepsItOpen) {
     EXPECT_TRUE(isOpen(fd.osdep()));
 }
 
+TEST_F(FileDescriptorTest, ASaferOneIsAssignedAsTheOtherIs) {
+    writeFile(path("f"), "");
+    const CountCalls closes(Call::close);
+    {
+        ScopedSaferFileDescriptor a(path("f"));
+        ScopedSaferFileDescriptor b;
+        const int number = a.osdep();
+        ScopedSaferFileDescriptor& self = a;
+        a = self;
+        EXPECT_TRUE(isOpen(a.osdep()));
+        b = a;
+        EXPECT_FALSE(a.valid());
+        EXPECT_EQ(b.osdep(), number);
+        b = b.release();
+        EXPECT_EQ(b.osdep(), number);
+        EXPECT_EQ(closes.count(), 0U);
+    }
+    EXPECT_EQ(closes.count(), 1U);
+}
+
 TEST_F(FileDescriptorTest, AScopedDescriptorHandsOverToAnother) {
     writeFile(path("f"), "");
     const CountCalls closes(Call::close);
@@ -425,7 +445,9 @@ TEST_F(FileDescriptorTest, ACopyOntoItselfIsRefused) {
     ASSERT_EQ(link(path("f").c_str(), path("hard").c_str()), 0);
     ASSERT_EQ(symlink("f", path("soft").c_str()), 0);
     for (const char* name : {"f", "hard", "soft"}) {
+        errno = 0;
         EXPECT_FALSE(path("f").copyTo(path(name))) << name;
+        EXPECT_EQ(errno, EINVAL);
     }
     EXPECT_EQ(readFile(path("f")), "precious");
 }

@@ -158,7 +158,7 @@ TEST(ThreadTest, AThreadThatCannotBeRegisteredSaysSoAndRuns) {
 TEST(ThreadTest, RegisteringAThreadTwiceIsAnAssertion) {
     const ChildResult result = child([] {
         const Thread mainThread;
-        Worker worker("w", [] { ActiveThreads::add(Thread::current()); });
+        Worker worker("w", [] { ActiveThreads::add(*ActiveThreads::current()); });
         worker.go();
         worker.join();
         return true;
@@ -228,6 +228,94 @@ TEST(ThreadTest, OnceTheMainThreadIsDyingAGatedWorkerMayBeAbandoned) {
     });
     EXPECT_EQ(result.status, 0) << result.err;
     EXPECT_EQ(result.err, "");
+}
+
+TEST(ThreadTest, AWorkerThatOutlivesItsObjectKeepsItsName) {
+    const ChildResult result = child([] {
+        const Thread mainThread;
+        std::atomic<bool> gone{false};
+        std::atomic<int> seen{0};
+        std::atomic<bool> running{false};
+        // Not of Worker's, whose members go with the object.
+        static std::function<void()> body;
+        body = [&] {
+            running = true;
+            while (!gone) {
+            }
+            seen =
+                Thread::current() == nullptr && std::string(Thread::currentName()) == "w" ? 1 : 2;
+        };
+        struct Outliving : Thread {
+            Outliving() : Thread("w") {}
+            void main() override { body(); }
+        };
+        auto worker = std::make_unique<Outliving>();
+        worker->go();
+        while (!running) {
+        }
+        Thread::mainThreadDying();
+        worker.reset();
+        gone = true;
+        while (seen == 0) {
+        }
+        return seen == 1;
+    });
+    EXPECT_EQ(result.status, 0) << result.signal;
+}
+
+TEST(ThreadTest, AnAbandonedGateIsNotPassedEvenWhenItWasOpened) {
+    const ChildResult result = child([] {
+        const Thread mainThread;
+        bool passed = true;
+        Worker worker("w", [&] {
+            auto& gate = *ActiveThreads::current();  // go() has opened it
+            gate.abandon();
+            passed = gate.pass() != nullptr || Thread::current() != nullptr;
+        });
+        worker.go();
+        worker.join();
+        return !passed;
+    });
+    EXPECT_EQ(result.status, 0) << result.signal;
+}
+
+// The clean-up of thread-specific data, in whatever order, finds the name or "Main Thread".
+TEST(ThreadTest, AnEndingThreadWithoutAnObjectMayStillAskForItsName) {
+    const ChildResult result = child([] {
+        const Thread mainThread;
+        static std::atomic<int> asked{0};
+        pthread_key_t keys[2];
+        const auto ask = [](void*) {
+            const std::string name = Thread::currentName();
+            if (Thread::current() == nullptr && (name == "w" || name == "Main Thread")) ++asked;
+        };
+        pthread_key_create(&keys[0], ask);
+        static std::atomic<bool> gone{false};
+        static std::atomic<bool> running{false};
+        static pthread_key_t* specific = keys;
+        struct Outliving : Thread {
+            Outliving() : Thread("w") {}
+            void main() override {
+                for (int i = 0; i < 2; ++i)
+                    pthread_setspecific(specific[i], this);
+                running = true;
+                while (!gone) {
+                }
+            }
+        };
+        auto worker = std::make_unique<Outliving>();
+        pthread_key_create(&keys[1], ask);
+        worker->go();
+        while (!running) {
+        }
+        Thread::mainThreadDying();
+        worker.reset();
+        gone = true;
+        while (asked < 2) {
+        }
+        return true;
+    });
+    EXPECT_EQ(result.status, 0) << result.signal;
 }
 
 TEST(ThreadTest, AThreadThatCannotBeCreatedThrows) {
@@ -438,6 +526,48 @@ TEST(InThreadActorQueueTest, RunsInOrderOnTheOwnersThread) {
     EXPECT_THAT(notes, testing::ElementsAre(1, 2));
     queue.submit(one);
     EXPECT_EQ(queue.runQueued(), 1U) << "an actor may be submitted again";
+}
+
+TEST(InThreadActorQueueTest, WhatCallbacksAddStaysForTheNextCall) {
+    struct Again : InThreadActor {
+        explicit Again(InThreadActorQueue& to) : queue(to) {}
+        void callback() override {
+            ++ran;
+            queue.submit(*this);
+        }
+        InThreadActorQueue& queue;
+        int ran = 0;
+    };
+    InThreadActorQueue queue;
+    Again again(queue);
+    queue.submit(again);
+    EXPECT_EQ(queue.runQueued(), 1U);
+    EXPECT_EQ(again.ran, 1);
+    EXPECT_EQ(queue.runQueued(), 1U);
+    EXPECT_EQ(again.ran, 2);
+}
+
+TEST(InThreadActorQueueTest, SubmittingWhatIsQueuedAlreadyIsAnAssertion) {
+    const ChildResult result = child([] {
+        InThreadActorQueue queue;
+        std::vector<int> notes;
+        Note note(notes, 1);
+        queue.submit(note);
+        queue.submit(note);
+        return true;
+    });
+    EXPECT_EQ(result.signal, SIGABRT);
+    EXPECT_THAT(result.err, MatchesRegex(assertion("!actor._queued")));
+}
+
+TEST(InThreadActorQueueTest, AWakeUpWithoutCauseDoesNotBeginTheTimeAnew) {
+    InThreadActorQueue queue;
+    const testsupport::ShortNth wake(Call::pthread_cond_clockwait, 1, 0);
+    EXPECT_FALSE(queue.waitForWork(1));
+    EXPECT_EQ(wake.count(), 2U);
+    EXPECT_EQ(testsupport::deadlines[0].tv_sec, testsupport::deadlines[1].tv_sec);
+    EXPECT_EQ(testsupport::deadlines[0].tv_nsec, testsupport::deadlines[1].tv_nsec);
+    EXPECT_GT(testsupport::deadlines[0].tv_nsec + testsupport::deadlines[0].tv_sec, 0);
 }
 
 TEST(InThreadActorQueueTest, ASubmitterMayWait) {

@@ -10,7 +10,7 @@
 #include <cstdarg>
 #include <string>
 
-inline namespace KORVEX_EXPORT korvex {
+KORVEX_NAMESPACE(korvex) {
 
 // A POSIX descriptor number, or -1 for none. A plain value: copies mean the same open file, and
 // nothing closes it by itself. Members neither throw nor log; failure is told by the result, with
@@ -60,7 +60,8 @@ class FileDescriptor {
     // makes no progress.
     bool copyTo(FileDescriptor outfd) const;
     // The same into a new or emptied file with this file's permission bits. False, with nothing
-    // done, when there is no descriptor, or when dest is this very file (device and inode).
+    // done, when there is no descriptor, or when dest is this very file (device and inode), which
+    // errno EINVAL tells.
     bool copyTo(const Pathname& dest) const;
 
   private:
@@ -97,7 +98,12 @@ class ScopedSaferFileDescriptor : public ScopedFileDescriptor {
     ScopedSaferFileDescriptor() = default;
     explicit ScopedSaferFileDescriptor(const Pathname& path);
     explicit ScopedSaferFileDescriptor(const FileDescriptor& fd) : ScopedFileDescriptor(fd) {}
+    ScopedSaferFileDescriptor(const ScopedSaferFileDescriptor&) = delete;
+    ~ScopedSaferFileDescriptor() = default;
+
     using ScopedFileDescriptor::operator=;
+    ScopedSaferFileDescriptor& operator=(ScopedSaferFileDescriptor& other);
+    ScopedSaferFileDescriptor& operator=(const ScopedSaferFileDescriptor&) = delete;
 };
 
 // One name in a directory.
@@ -137,4 +143,4 @@ class DirectoryDescriptor {
     DIR* _dir = nullptr;
 };
 
-}  // namespace korvex
+}  // KORVEX_NAMESPACE(korvex)

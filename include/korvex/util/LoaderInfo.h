@@ -1,17 +1,17 @@
 #pragma once
 
 #include <korvex/Export.h>
+#include <korvex/XmlNode.h>
 #include <korvex/util/Pathname.h>
 
 #include <sys/types.h>
-#include <xmlwrapp/node.h>
 
 #include <cstdint>
 #include <ctime>
 #include <memory>
 #include <string>
 
-inline namespace KORVEX_EXPORT korvex {
+KORVEX_NAMESPACE(korvex) {
 
 // How the process was started: its directories (from the environment), its options (from the
 // command line, by popt), its id and start time. Everybody asks the one instance; the main thread
@@ -77,10 +77,10 @@ class LoaderInfo {
     bool getUseDebugLog() const { return _useDebugLog; }  // start with the debug log configuration
 
     // The component's configuration node; the reference is to the record's own.
-    const xml::node& getCommonComponentNode() const { return _commonComponentNode; }
-    xml::node& getCommonComponentNode() { return _commonComponentNode; }
+    const XmlNode& getCommonComponentNode() const { return _commonComponentNode; }
+    XmlNode& getCommonComponentNode() { return _commonComponentNode; }
     // Stores a copy.
-    void setCommonComponentNode(const xml::node& node);
+    void setCommonComponentNode(const XmlNode& node);
 
     // The configuration directory (home and "etc"), and that of this installation below it.
     Pathname getCommonConfigPath() const;
@@ -106,7 +106,7 @@ class LoaderInfo {
     pid_t _pid = 0;
     time_t _startupTime = 0;
     std::string _host;
-    xml::node _commonComponentNode;
+    XmlNode _commonComponentNode;
     bool _isDebug = false;
     bool _useDebugLog = false;
     bool _isDaemon = false;
@@ -115,4 +115,4 @@ class LoaderInfo {
     bool _optionsError = false;
 };
 
-}  // namespace korvex
+}  // KORVEX_NAMESPACE(korvex)

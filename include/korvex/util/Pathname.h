@@ -10,7 +10,7 @@
 #include <string>
 #include <vector>
 
-inline namespace KORVEX_EXPORT korvex {
+KORVEX_NAMESPACE(korvex) {
 
 class DirectoryDescriptor;
 class DirectoryEntry;
@@ -169,4 +169,4 @@ class PathList : public std::vector<Pathname> {
     void push_back_separated(const char* s, char sep);
 };
 
-}  // namespace korvex
+}  // KORVEX_NAMESPACE(korvex)

@@ -6,7 +6,7 @@
 #include <cstddef>
 #include <memory>
 
-inline namespace KORVEX_EXPORT korvex {
+KORVEX_NAMESPACE(korvex) {
 
 // A piece of work that is handed to another thread to run, through an InThreadActorQueue.
 class InThreadActor {
@@ -25,11 +25,13 @@ class InThreadActor {
     bool _wantWake = false;          // the submitter waits
     ConditionWakeAll _cond;          // where it waits
     bool _ran = false;               // the work has run
+    bool _queued = false;            // it waits on a queue
     InThreadActor* _next = nullptr;  // in the queue
 };
 
 // Work for one thread, in the order in which it was submitted. Any thread may submit; the thread
-// that owns the queue runs it. Actors are not owned and are on one queue at a time.
+// that owns the queue runs it. Actors are not owned and are on one queue at a time, once: a second
+// submission before the actor has begun to run is a failed assertion.
 class InThreadActorQueue {
   public:
     InThreadActorQueue() = default;
@@ -43,8 +45,9 @@ class InThreadActorQueue {
     // call, so it must not delete itself; the owner itself would wait for ever.
     void submitAndWait(InThreadActor& actor);
 
-    // For the owner: runs what is queued, also what callbacks add meanwhile, and tells how many
-    // actors that were. An exception of a callback comes through; the rest stays queued.
+    // For the owner: runs what is queued at the call, in order, and tells how many actors that
+    // were. What callbacks add meanwhile, themselves perhaps, stays for the next call. An exception
+    // of a callback comes through; the rest stays queued.
     std::size_t runQueued();
     // For the owner: waits until there is work, at most timeoutSecs seconds; whether there is.
     bool waitForWork(unsigned int timeoutSecs);
@@ -52,12 +55,14 @@ class InThreadActorQueue {
   private:
     void append(InThreadActor& actor) KORVEX_REQUIRES(_mutex);
     InThreadActor* takeFirst();
+    std::size_t queued();
     void markRan(InThreadActor& actor);
 
     Mutex _mutex;  // guards the list and the actors' bookkeeping
     ConditionWakeAll _submitted;
     InThreadActor* _first KORVEX_GUARDED_BY(_mutex) = nullptr;
     InThreadActor** _lastp KORVEX_GUARDED_BY(_mutex) = &_first;
+    std::size_t _queued KORVEX_GUARDED_BY(_mutex) = 0;
 };
 
 // A thread. Derive, implement main(), build the object, call go(), and join() it exactly once:
@@ -72,7 +77,15 @@ class InThreadActorQueue {
 // the process (std::terminate). join() and the destructor belong to one thread.
 //
 // After fork(2) the child has none of the parent's threads: it must not join or destroy their
-// objects, and may build Threads of its own only if the parent was building and ending none.
+// objects. It may build Threads of its own.
+//
+// After mainThreadDying() this object may be destroyed while its operating-system thread still
+// runs: the thread keeps its name and finds current() null. But nothing can guard the object's own
+// members: once go() was called, either main() is known to have begun, and touches the object no
+// more, or the thread is joined.
+//
+// A derived class whose constructor throws leaves a thread that nobody can join: the destructor's
+// assertion ends the process. Do in main() what may fail.
 class Thread : public PthreadObject {
   public:
     // Joins and then deletes its thread. Queue it on another thread (submit(), never
@@ -97,7 +110,7 @@ class Thread : public PthreadObject {
     Thread(const Thread&) = delete;
     Thread& operator=(const Thread&) = delete;
     // A failed assertion when the thread was not joined, unless mainThreadDying() was called; then
-    // a thread still at its gate ends without running main().
+    // a thread that is still at its gate ends without running main(), opened or not.
     virtual ~Thread() noexcept(false);
 
     // The body of the thread. Not called for the main thread's object.
@@ -118,10 +131,11 @@ class Thread : public PthreadObject {
     // This thread's join helper; belongs to the thread.
     JoinHelper& joinHelper() { return _jhelp; }
 
-    // The calling thread's object; null on the main thread and on threads not made by this class.
-    // Takes no lock.
+    // The calling thread's object; null on the main thread, on threads not made by this class, and
+    // once the object is gone. Takes no lock.
     static Thread* current();
-    // The calling thread's name; "Main Thread" where current() is null. Takes no lock.
+    // The calling thread's name, even when its object is gone; "Main Thread" on the main thread and
+    // on threads not made by this class. Takes no lock.
     static const char* currentName();
 
     // For the end of the process: from now on failures of the thread library are ignored and
@@ -129,7 +143,10 @@ class Thread : public PthreadObject {
     static void mainThreadDying();
 
   private:
+    friend class ActiveThreads;
+
     class Gate;
+    struct Start;
 
     static void* callMain(void* arg);
     void start();
@@ -145,4 +162,4 @@ class Thread : public PthreadObject {
     JoinHelper _jhelp;
 };
 
-}  // namespace korvex
+}  // KORVEX_NAMESPACE(korvex)

@@ -8,7 +8,9 @@
 #include <cstdint>
 #include <stdexcept>
 
-inline namespace KORVEX_EXPORT korvex {
+KORVEX_NAMESPACE(korvex) {
+
+class KORVEX_HIDDEN Deadline;
 
 // What a failed thread-library call becomes: what() names the thread, the call and the error.
 class PthreadException : public std::runtime_error {
@@ -157,6 +159,10 @@ class ConditionBaseClass : public PthreadObject {
     void internal_wake_all();
 
   private:
+    friend class InThreadActorQueue;
+
+    bool waitUntil(Mutex& mutex, const Deadline& deadline) KORVEX_REQUIRES(mutex);
+
     pthread_cond_t _pthread_cond{};
 };
 
@@ -212,4 +218,4 @@ class ThreadSpecificPointer {
     TSP_Implementor _impl;
 };
 
-}  // namespace korvex
+}  // KORVEX_NAMESPACE(korvex)

@@ -7,7 +7,7 @@
 #include <ctime>
 #include <string>
 
-inline namespace KORVEX_EXPORT korvex {
+KORVEX_NAMESPACE(korvex) {
 
 // A wall-clock instant: seconds and microseconds since the Unix epoch. Seconds keep to the signed
 // 32-bit range whatever the platform's time_t is: additions and the clock saturate at the largest
@@ -51,8 +51,10 @@ class Timeval {
     // Whole seconds times a million plus the rest in MILLIseconds: 2.5 s are 2000500. Callers rely
     // on it, describeDifference among them; compute true microseconds yourself.
     static long long usecDifference(const Timeval& later, const Timeval& earlier);
-    // The distance for people: "3.250 seconds", "2.500 hours", "1 microsecond", with "-" in front
-    // when `later` comes first. Built on usecDifference. Throws std::bad_alloc.
+    // The distance for people: "2.500 hours", "42.00 seconds", "2000 milliseconds", "0
+    // microseconds", with "-" in front when `later` comes first. Built on usecDifference, so what
+    // is less than a second shows as a thousandth of itself: 3.25 s are "3.000 seconds", 1 ms is
+    // "1 microsecond". Throws std::bad_alloc.
     static std::string describeDifference(const Timeval& later, const Timeval& earlier);
 
     // The same from this instant to now.
@@ -91,4 +93,4 @@ class CurrentTimeval : public Timeval {
 KORVEX_EXPORT bool convert_string_to_milliseconds(const char* p, unsigned long long* res,
                                                   unsigned long* charCount);
 
-}  // namespace korvex
+}  // KORVEX_NAMESPACE(korvex)

@@ -39,7 +39,11 @@ bool FileDescriptor::copyTo(FileDescriptor outfd) const {
 }
 
 bool FileDescriptor::copyTo(const Pathname& dest) const {
-    if (!valid() || isSameFile(*this, dest)) return false;
+    if (!valid()) return false;
+    if (isSameFile(*this, dest)) {
+        errno = EINVAL;
+        return false;
+    }
     ScopedFileDescriptor out;
     out = dest.openCreateOrReplace(*this);
     return out.valid() && copyTo(static_cast<FileDescriptor>(out));

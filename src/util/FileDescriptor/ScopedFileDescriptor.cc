@@ -30,4 +30,9 @@ FileDescriptor ScopedFileDescriptor::release() {
 ScopedSaferFileDescriptor::ScopedSaferFileDescriptor(const Pathname& path)
     : ScopedFileDescriptor(path.openReadOnlySafer()) {}
 
+ScopedSaferFileDescriptor& ScopedSaferFileDescriptor::operator=(ScopedSaferFileDescriptor& other) {
+    ScopedFileDescriptor::operator=(static_cast<ScopedFileDescriptor&>(other));
+    return *this;
+}
+
 }  // namespace korvex

@@ -123,6 +123,7 @@ void LogAppender::finalSetup(const char* name) KORVEX_NO_THREAD_SAFETY_ANALYSIS 
         LogFormat::internal(this, WARN, "Appender \"%s\" %s", name, warning);
     if (writesToFile()) {
         Report report(this);
+        closeFd();  // a report of another appender may have come here already
         openFile(report);
         report.deliver();
         closeFd();

@@ -15,7 +15,9 @@ LogAppender* LogAppender::find(const std::string& name, bool create) {
     const auto found = appenders().find(name);
     if (found != appenders().end()) return found->second.get();
     if (!create) return nullptr;
-    return appenders().emplace(name, std::make_unique<LogAppender>()).first->second.get();
+    auto made = std::make_unique<LogAppender>();
+    made->_registered = true;
+    return appenders().emplace(name, std::move(made)).first->second.get();
 }
 
 }  // namespace korvex

@@ -2,11 +2,13 @@
 
 #include <korvex/util/Logger.h>
 
+#include <cerrno>
 #include <string>
+#include <vector>
 
 inline namespace korvex {
 
-// A failure met while an appender holds its lock: put into words at once, with the errno of the
+// The failures met while an appender holds its lock: put into words at once, with the errno of the
 // failed call, and delivered when the lock is free, because the way of the report may lead through
 // other appenders' locks.
 class KORVEX_HIDDEN LogAppender::Report {
@@ -20,21 +22,25 @@ class KORVEX_HIDDEN LogAppender::Report {
         note(CRIT, fmt, file);
     }
     void deliver() const {
-        if (_pending) LogFormat::internal(_appender, _level, "%s", _text.c_str());
+        for (const Note& note : _notes)
+            LogFormat::internal(_appender, note.level, "%s", note.text.c_str());
     }
 
   private:
+    struct Note {
+        LogLevel level;
+        std::string text;
+    };
+
     void note(LogLevel level, const char* fmt, const Pathname& file)
         __attribute__((format(printf, 3, 0))) {
-        Logger::format(_text, fmt, file.c_str());
-        _level = level;
-        _pending = true;
+        const int errnum = errno;
+        _notes.push_back({level, {}});
+        Logger::format(_notes.back().text, errnum, fmt, file.c_str());
     }
 
     const LogAppender* const _appender;
-    bool _pending = false;
-    LogLevel _level{};
-    std::string _text;
+    std::vector<Note> _notes;  // a line that was cut, and then a new file that cannot be opened
 };
 
 }  // namespace korvex

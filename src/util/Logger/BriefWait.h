@@ -16,4 +16,18 @@ inline void waitBriefly(const std::atomic<bool>& busy) {
     }
 }
 
+// Says so for a scope.
+class WhileWriting {
+  public:
+    explicit WhileWriting(std::atomic<bool>& busy) : _busy(busy) {
+        _busy.store(true, std::memory_order_relaxed);
+    }
+    WhileWriting(const WhileWriting&) = delete;
+    WhileWriting& operator=(const WhileWriting&) = delete;
+    ~WhileWriting() { _busy.store(false, std::memory_order_relaxed); }
+
+  private:
+    std::atomic<bool>& _busy;
+};
+
 }  // namespace korvex

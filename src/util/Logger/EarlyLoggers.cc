@@ -2,7 +2,7 @@
 
 #include "base/Assert.h"
 #include "base/NeverDestroyed.h"
-#include "util/Logger/NologLock.h"
+#include "util/Logger/LoggingLock.h"
 
 inline namespace korvex {
 
@@ -19,7 +19,7 @@ void EarlyLoggers::bind(Logger& logger) {
 }
 
 void EarlyLoggers::add(Logger& logger) {
-    const NologLock lock(mutex());
+    const LoggingLock lock(mutex());
     if (logger_initialized) {
         bind(logger);
         return;
@@ -29,7 +29,7 @@ void EarlyLoggers::add(Logger& logger) {
 }
 
 void EarlyLoggers::remove(Logger& logger) {
-    const NologLock lock(mutex());
+    const LoggingLock lock(mutex());
     for (Logger** link = &uninitialized_loggers; *link != nullptr; link = &(*link)->_next) {
         if (*link == &logger) {
             *link = logger._next;
@@ -39,7 +39,7 @@ void EarlyLoggers::remove(Logger& logger) {
 }
 
 bool EarlyLoggers::isUnusable(const Logger& logger) {
-    const NologLock lock(mutex());
+    const LoggingLock lock(mutex());
     if (logger_initialized) return false;  // it has been emptied meanwhile
     for (const Logger* l = uninitialized_loggers; l != nullptr; l = l->_next) {
         if (l == &logger) return false;
@@ -48,14 +48,16 @@ bool EarlyLoggers::isUnusable(const Logger& logger) {
 }
 
 void EarlyLoggers::initialize() {
-    const NologLock lock(mutex());
+    const LoggingLock lock(mutex());
     KORVEX_ASSERT(!logger_initialized);
     epoch_timeval();
     logger_initialized = true;
+    // A logger that is bound is its owner's alone again and may be destroyed at once: taken off the
+    // list first, it is not looked at after that.
     while (Logger* const logger = uninitialized_loggers) {
-        bind(*logger);
         uninitialized_loggers = logger->_next;
         logger->_next = nullptr;
+        bind(*logger);
     }
 }
 

@@ -3,7 +3,7 @@
 #include "base/ThreadText.h"
 #include "util/Logger/AppenderReport.h"
 #include "util/Logger/BriefWait.h"
-#include "util/Logger/NologLock.h"
+#include "util/Logger/LoggingLock.h"
 #include "util/Logger/RootObjects.h"
 
 #include <sys/stat.h>
@@ -25,7 +25,7 @@ LogAppender::LogAppender(FileDescriptor fd, const LogFormat* layout) : _fd(fd), 
 
 // Nobody else may know an appender that is being destroyed, so no lock is taken.
 LogAppender::~LogAppender() noexcept KORVEX_NO_THREAD_SAFETY_ANALYSIS {
-    if (!_filename.empty()) _fd.close();
+    closeFd();
 }
 
 // The root appender stays what it is, whatever file name it was given.
@@ -35,37 +35,45 @@ bool LogAppender::writesToFile() const {
 
 // The report of another appender may arrive before this one's configuration is complete.
 const LogFormat& LogAppender::layout() const {
-    return _fmt != nullptr ? *_fmt : defaultFormat();
+    return _fmt != nullptr ? *_fmt : rootAppender().layout();
 }
 
 void LogAppender::write(const LogMsgMetadata& mdata, const std::string& msg) {
+    tryWrite(mdata, msg);
+}
+
+bool LogAppender::tryWrite(const LogMsgMetadata& mdata, const std::string& msg) {
     ThreadText m;
     layout().apply(*m, mdata, msg);
     Report report(this);
     waitBriefly(_writing);
+    bool written = false;
     {
-        const NologLock lock(_mutex);
-        _writing.store(true, std::memory_order_relaxed);
-        writeLine(*m, mdata.stamp.sec(), report);
-        _writing.store(false, std::memory_order_relaxed);
+        const bool kept = _registered || this == &rootAppender();
+        const LoggingLock lock(_mutex, kept ? LoggingLock::KEPT_THROUGH_FORKS : LoggingLock::OWN);
+        const WhileWriting busy(_writing);
+        written = writeLine(*m, mdata.stamp.sec(), report);
     }
     report.deliver();
+    return written;
 }
 
-void LogAppender::writeLine(const std::string& line, long long now, Report& report) {
+bool LogAppender::writeLine(const std::string& line, long long now, Report& report) {
     if (writesToFile()) checkIdentity(now);
-    if (!_fd.valid() && !openAndInitFile(now, report)) return;
+    if (!_fd.valid() && !openAndInitFile(now, report)) return false;
     errno = 0;  // a short count without an error must not be told with an older one
     const int written = _fd.write(line.data(), line.size());
+    const bool whole = written >= 0 && static_cast<std::size_t>(written) == line.size();
+    if (!whole) __extension__ report.crit("Error writing to \"%s\": %m", _filename);
     if (written > 0) _curSize += written;
-    if (written < 0 || static_cast<std::size_t>(written) < line.size()) {
-        const int error = errno;
-        if (writesToFile()) closeFd();
-        errno = error;
-        __extension__ report.crit("Error writing to \"%s\": %m", _filename);
-        return;
+    if (!writesToFile()) return whole;
+    // Also behind a line that was cut, or a file that is full at this size would stay so for ever.
+    if (written > 0 && _maxSize > 0 && _curSize > _maxSize) {
+        rotateFile(now, report);
+    } else if (!whole) {
+        closeFd();
     }
-    if (writesToFile() && _maxSize > 0 && _curSize > _maxSize) rotateFile(now, report);
+    return whole;
 }
 
 // Lets go of a file that was removed, renamed or replaced, for instance by a rotation from outside.
@@ -91,10 +99,8 @@ bool LogAppender::openAndInitFile(long long now, Report& report) {
     if (!openFile(report)) return false;
     struct stat st {};
     if (!_fd.stat(&st)) {
-        const int error = errno;
-        closeFd();
-        errno = error;
         __extension__ report.crit("Error calling fstat on \"%s\": %m", _filename);
+        closeFd();
         return false;
     }
     _curSize = st.st_size;
@@ -104,8 +110,13 @@ bool LogAppender::openAndInitFile(long long now, Report& report) {
     return true;
 }
 
+// A descriptor without a file name was handed in, or is standard error: it is let go only.
 void LogAppender::closeFd() {
-    _fd.close();
+    if (writesToFile()) {
+        _fd.close();
+    } else {
+        _fd = FileDescriptor();
+    }
 }
 
 }  // namespace korvex

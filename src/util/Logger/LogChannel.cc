@@ -5,7 +5,7 @@
 #include "base/NeverDestroyed.h"
 #include "util/Logger/ChannelRegistry.h"
 #include "util/Logger/LevelWords.h"
-#include "util/Logger/NologLock.h"
+#include "util/Logger/LoggingLock.h"
 #include "util/Logger/Reporting.h"
 #include "util/Logger/RootObjects.h"
 
@@ -26,7 +26,7 @@ LogChannel::LogChannel(const LogChannel& other)
 
 LogChannel* LogChannel::find(const std::string& name, bool create) {
     ChannelRegistry& known = ChannelRegistry::instance();
-    const NologLock lock(known.mutex);
+    const LoggingLock lock(known.mutex);
     const auto found = known.channels.find(name);
     if (found != known.channels.end()) return found->second.get();
     if (!create) return &rootChannel();
@@ -84,9 +84,8 @@ bool LogChannel::write(const LogMsgMetadata& mdata, const std::string& msg,
                        const LogAppender* dont_touch) {
     bool written = false;
     const auto offer = [&](LogAppender& appender) {
-        if (&appender == dont_touch || ReportingMark::covers(&appender)) return;
-        appender.write(mdata, msg);
-        written = true;
+        if (&appender == dont_touch || ReportingMark::hasFailed(&appender)) return;
+        if (appender.tryWrite(mdata, msg)) written = true;
     };
     if (_appenders.empty()) offer(rootAppender());
     for (LogAppender* const appender : _appenders)

@@ -1,12 +1,17 @@
 #include <korvex/util/Logger/LogEpoch.h>
 
 #include "base/NeverDestroyed.h"
+#include "util/Logger/Epoch.h"
 
 inline namespace korvex {
 
-const Timeval& epoch_timeval() {
-    static NeverDestroyed<CurrentTimeval> tv;
+FirstUse<CurrentTimeval>& epoch() {
+    static NeverDestroyed<FirstUse<CurrentTimeval>> tv;
     return *tv;
+}
+
+const Timeval& epoch_timeval() {
+    return epoch().get();
 }
 
 }  // namespace korvex

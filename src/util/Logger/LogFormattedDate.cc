@@ -3,6 +3,7 @@
 #include <korvex/util/Logger/LogMsgMetadata.h>
 
 #include "base/Digits.h"
+#include "platform/LibcLock.h"
 
 #include <algorithm>
 #include <charconv>
@@ -138,7 +139,9 @@ const struct tm& CachedTm::get(const LogMsgMetadata& md) {
 
 unsigned long CachedTm::ftime(char* buf, unsigned long size, const char* fmt,
                               const LogMsgMetadata& md) {
-    return std::strftime(buf, size, fmt, &get(md));
+    const struct tm& stamp = get(md);
+    const LibcLock lock;
+    return std::strftime(buf, size, fmt, &stamp);
 }
 
 // The memory strftime writes to: local at first, grown by doubling, kept for the later pieces.

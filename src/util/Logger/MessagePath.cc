@@ -1,11 +1,13 @@
 #include <korvex/util/Logger.h>
 
+#include "base/CancelShield.h"
 #include "base/ErrnoKeeper.h"
-#include "base/NeverDestroyed.h"
+#include "base/HeldLocks.h"
 #include "base/PlainFormat.h"
 #include "base/ThreadText.h"
 #include "util/Logger/EarlyLoggers.h"
 #include "util/Logger/FallbackToStderr.h"
+#include "util/Logger/InternalLogger.h"
 #include "util/Logger/Reporting.h"
 
 inline namespace korvex {
@@ -45,44 +47,38 @@ bool formatInto(std::string& text, int errnum, const char* fmt, va_list ap) noex
     }
 }
 
-Logger& internalLogger() {
-    static NeverDestroyed<Logger> int_logger("Logger");
-    return *int_logger;
-}
-
-// Stands in while the internal logger is unbound: the root channel's minimum is none of the
-// logging system's business.
-LogChannel& emptyChannel() {
-    static NeverDestroyed<LogChannel> empty_channel;
-    return *empty_channel;
-}
-
 }  // namespace
+
+bool LogFormat::findTaker(const Logger& logger, LogLevel level, LogChannel*& taker) {
+    taker = nullptr;
+    // A signal handler that interrupted logging would wait for what its own thread holds.
+    if (HeldLocks::any()) return logger.channel().passes(level);
+    if (check_for_unitialized_logger(&logger)) return true;
+    taker = &logger.channel();
+    return taker->passes(level);
+}
 
 void LogFormat::do_log(Logger* logger, LogLevel level, const std::string& text) noexcept {
     const ErrnoKeeper keeper;
+    const CancelShield shield;
     LogChannel* channel = nullptr;
-    if (!check_for_unitialized_logger(logger)) {
-        channel = &logger->channel();
-        if (!channel->passes(level)) return;
-    }
+    if (!findTaker(*logger, level, channel)) return;
     deliver(channel, logger, level, text);
 }
 
 void LogFormat::do_log(Logger* logger, LogLevel level, const char* fmt, va_list ap) noexcept {
     const ErrnoKeeper keeper;
+    const CancelShield shield;
     LogChannel* channel = nullptr;
-    if (!check_for_unitialized_logger(logger)) {
-        channel = &logger->channel();
-        if (!channel->passes(level)) return;
-    }
+    if (!findTaker(*logger, level, channel)) return;
     ThreadText text;
     if (formatInto(*text, keeper.saved(), fmt, ap)) deliver(channel, logger, level, *text);
 }
 
 void LogFormat::internal(const LogAppender* skip, LogLevel level, const char* fmt, ...) noexcept {
     const ErrnoKeeper keeper;
-    Logger& int_logger = internalLogger();
+    const CancelShield shield;
+    Logger& int_logger = internalLogger().get("Logger");
     LogChannel* const bound = int_logger._channel.load(std::memory_order_acquire);
     LogChannel& channel = bound != nullptr ? *bound : emptyChannel();
     if (!channel.passes(level)) return;

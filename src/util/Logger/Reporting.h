@@ -2,35 +2,56 @@
 
 #include <korvex/util/Logger/LogAppender.h>
 
+#include <vector>
+
 inline namespace korvex {
 
-// Marks, for its scope, that this thread is reporting a failure of `appender` (null: a problem
-// that is no appender's), so that the report goes round every appender that has failed already
-// and two broken appenders cannot report into each other for ever.
+// Marks, for its scope, that this thread is delivering a report: one of the logging system's own
+// messages. An appender that fails meanwhile reports that in turn, within the scope; so the
+// outermost mark remembers who has failed, and such an appender is not tried again before that
+// scope ends. Each failure is told once, and any number of broken appenders come to an end.
 class ReportingMark {
   public:
-    explicit ReportingMark(const LogAppender* appender) : _appender(appender), _below(_top) {
-        _top = this;
+    // `failed` is the appender whose failure is reported; null when it is no appender's.
+    explicit ReportingMark(const LogAppender* failed) : _outermost(_top == nullptr) {
+        if (_outermost) _top = this;
+        if (failed != nullptr) _top->remember(failed);
     }
     ReportingMark(const ReportingMark&) = delete;
     ReportingMark& operator=(const ReportingMark&) = delete;
-    ~ReportingMark() { _top = _below; }
+    ~ReportingMark() {
+        if (_outermost) _top = nullptr;
+    }
 
-    // Whether this thread is reporting a failure of the appender.
-    static bool covers(const LogAppender* appender) {
-        for (const ReportingMark* mark = _top; mark != nullptr; mark = mark->_below) {
-            if (mark->_appender == appender) return true;
+    // Whether the appender has failed, and so is not to be tried, in the report that this thread is
+    // delivering just now.
+    static bool hasFailed(const LogAppender* appender) {
+        return _top != nullptr && _top->remembers(appender);
+    }
+
+  private:
+    void remember(const LogAppender* failed) noexcept {
+        try {
+            _failed.push_back(failed);
+        } catch (...) {  // no memory: then nobody is tried, and standard error tells
+            _everybody = true;
+        }
+    }
+    bool remembers(const LogAppender* appender) const {
+        if (_everybody) return true;
+        for (const LogAppender* const failed : _failed) {
+            if (failed == appender) return true;
         }
         return false;
     }
 
-  private:
-    const LogAppender* const _appender;
-    const ReportingMark* const _below;
+    const bool _outermost;
+    bool _everybody = false;
+    std::vector<const LogAppender*> _failed;
 
     // A plain pointer: it needs no construction and no destruction, so it works in exit handlers
     // and in ending threads.
-    static inline thread_local const ReportingMark* _top = nullptr;
+    static inline thread_local ReportingMark* _top = nullptr;
 };
 
 }  // namespace korvex

@@ -19,15 +19,15 @@ void Thread::Gate::open() {
 
 void Thread::Gate::abandon() {
     const ScopedMutex lock(readyToRunLock());
-    _abandoned = true;
+    _thread.store(nullptr, std::memory_order_release);
     _ready_to_run_cond.wake_all();
 }
 
-bool Thread::Gate::pass() {
+Thread* Thread::Gate::pass() {
     ScopedMutex lock(readyToRunLock());
-    while (!_ready_to_run && !_abandoned)
+    while (!_ready_to_run && thread() != nullptr)
         _ready_to_run_cond.wait(lock);
-    return _ready_to_run;
+    return thread();
 }
 
 }  // namespace korvex

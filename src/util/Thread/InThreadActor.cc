@@ -1,5 +1,8 @@
 #include <korvex/util/Thread.h>
 
+#include "base/Assert.h"
+#include "platform/CondTimedWait.h"
+
 inline namespace korvex {
 
 InThreadActor::~InThreadActor() noexcept(false) = default;
@@ -25,16 +28,21 @@ void InThreadActorQueue::submitAndWait(InThreadActor& actor) {
 }
 
 void InThreadActorQueue::append(InThreadActor& actor) {
+    KORVEX_ASSERT(!actor._queued);
+    actor._queued = true;
     actor._ran = false;
     actor._next = nullptr;
     *_lastp = &actor;
     _lastp = &actor._next;
+    ++_queued;
     _submitted.wake_all();
 }
 
 std::size_t InThreadActorQueue::runQueued() {
-    std::size_t count = 0;
-    while (InThreadActor* const actor = takeFirst()) {
+    const std::size_t atTheCall = queued();
+    for (std::size_t count = 0; count < atTheCall; ++count) {
+        InThreadActor* const actor = takeFirst();
+        if (actor == nullptr) return count;  // another thread runs the queue too
         // An actor nobody waits for may delete itself in its callback: not a look at it after that.
         if (!actor->_wantWake) {
             actor->callback();
@@ -46,14 +54,20 @@ std::size_t InThreadActorQueue::runQueued() {
             } onEveryWayOut{*this, *actor};
             actor->callback();
         }
-        ++count;
     }
-    return count;
+    return atTheCall;
+}
+
+std::size_t InThreadActorQueue::queued() {
+    const ScopedMutex lock(_mutex);
+    return _queued;
 }
 
 bool InThreadActorQueue::waitForWork(unsigned int timeoutSecs) {
     ScopedMutex lock(_mutex);
-    while (_first == nullptr && _submitted.wait(lock, timeoutSecs)) {
+    // One deadline for all waits: a wake-up without cause does not begin the time anew.
+    const Deadline deadline(timeoutSecs);
+    while (_first == nullptr && _submitted.waitUntil(_mutex, deadline)) {
     }
     return _first != nullptr;
 }
@@ -64,6 +78,8 @@ InThreadActor* InThreadActorQueue::takeFirst() {
     if (actor == nullptr) return nullptr;
     _first = actor->_next;
     if (_first == nullptr) _lastp = &_first;
+    --_queued;
+    actor->_queued = false;
     return actor;
 }
 

@@ -1,6 +1,7 @@
 #include <korvex/util/Thread.h>
 
 #include "base/Assert.h"
+#include "platform/AtFork.h"
 #include "util/Thread/ActiveThreads.h"
 #include "util/Thread/Gate.h"
 #include "util/ThreadObj/CheckThreadErrors.h"
@@ -22,12 +23,11 @@ std::atomic<bool> main_thread_created{false};
 // Set up by the main thread's object; the attributes of every thread created afterwards.
 pthread_attr_t s_threadAttr;
 
-// What a new operating-system thread is given. Not the Thread object: that may be gone before the
-// thread reads it.
-struct Start {
-    Thread* thread;
-    std::shared_ptr<void> gate;
-};
+// A child of fork(2) has none of the threads that would free these. What fails under them is
+// logged, so they come before the logging system's.
+KORVEX_REGISTERS_THREAD_LOCKS void keepLocksThroughForks() {
+    pthread_atfork(&ActiveThreads::takeLocks, &ActiveThreads::freeLocks, &ActiveThreads::freeLocks);
+}
 
 void setStackSize(std::size_t bytes) {
     const int rval = pthread_attr_setstacksize(&s_threadAttr, bytes);
@@ -40,7 +40,17 @@ void setStackSize(std::size_t bytes) {
 
 }  // namespace
 
-Thread::Thread() : _name(main_thread_string), _did_join(true), _gate(new Gate), _jhelp(this) {
+// What a new operating-system thread is given. Not the Thread object: that may be gone before the
+// thread reads it.
+struct KORVEX_HIDDEN Thread::Start {
+    std::shared_ptr<Gate> gate;
+};
+
+Thread::Thread()
+    : _name(main_thread_string),
+      _did_join(true),
+      _gate(std::make_shared<Gate>(this, _name)),
+      _jhelp(this) {
     _token = PthreadToken::self();
     _gate->open();
     if (main_thread_created.exchange(true)) throw PthreadException("Main Thread created twice!");
@@ -49,13 +59,13 @@ Thread::Thread() : _name(main_thread_string), _did_join(true), _gate(new Gate), 
 }
 
 Thread::Thread(const char* thrname)
-    : _name(thrname), _did_join(false), _gate(new Gate), _jhelp(this) {
+    : _name(thrname), _did_join(false), _gate(std::make_shared<Gate>(this, _name)), _jhelp(this) {
     if (!main_thread_created) throw PthreadException("Thread created before main thread!");
     start();
 }
 
 void Thread::start() {
-    auto arg = std::make_unique<Start>(Start{this, _gate});
+    auto arg = std::make_unique<Start>(Start{_gate});
     const int rval = pthread_create(&_token._token, &s_threadAttr, &Thread::callMain, arg.get());
     checkPtRes("pthread_create", rval);
     if (rval != 0) return;  // with checking off: there is no thread, and none to join
@@ -74,13 +84,9 @@ Thread::~Thread() noexcept(false) {
 
 void* Thread::callMain(void* arg) {
     const std::unique_ptr<Start> start(static_cast<Start*>(arg));
-    Thread* const thread = start->thread;
-    ActiveThreads::add(thread);
-    if (static_cast<Gate*>(start->gate.get())->pass()) {
-        thread->main();
-    } else {
-        ActiveThreads::forgetCurrent();
-    }
+    const bool registered = ActiveThreads::add(*start->gate);
+    if (Thread* const thread = start->gate->pass()) thread->main();
+    if (!registered) ActiveThreads::forgetCurrent();
     return nullptr;
 }
 
@@ -105,12 +111,13 @@ bool Thread::operator==(const Thread& other) const {
 }
 
 Thread* Thread::current() {
-    return ActiveThreads::current();
+    const Gate* const gate = ActiveThreads::current();
+    return gate != nullptr ? gate->thread() : nullptr;
 }
 
 const char* Thread::currentName() {
-    const Thread* const thread = current();
-    return thread != nullptr ? thread->_name : main_thread_string;
+    const Gate* const gate = ActiveThreads::current();
+    return gate != nullptr ? gate->name() : main_thread_string;
 }
 
 void Thread::mainThreadDying() {

@@ -19,7 +19,11 @@ void ConditionBaseClass::wait(Mutex& mutex) {
 }
 
 bool ConditionBaseClass::wait(Mutex& mutex, unsigned int timeoutSecs) {
-    const int rval = condTimedWait(&_pthread_cond, &mutex._pthread_mutex, timeoutSecs);
+    return waitUntil(mutex, Deadline(timeoutSecs));
+}
+
+bool ConditionBaseClass::waitUntil(Mutex& mutex, const Deadline& deadline) {
+    const int rval = condTimedWait(&_pthread_cond, &mutex._pthread_mutex, deadline);
     if (rval != ETIMEDOUT) checkPtRes("pthread_cond_timedwait_relative_np", rval);
     return rval == 0;
 }

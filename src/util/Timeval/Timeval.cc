@@ -1,6 +1,7 @@
 #include <korvex/util/Timeval.h>
 
 #include "base/Assert.h"
+#include "platform/LibcLock.h"
 
 #include <algorithm>
 #include <cstdlib>
@@ -79,6 +80,7 @@ void Timeval::addMsec(unsigned long long msecs) {
 }
 
 void Timeval::localtime(struct tm& out) const {
+    const LibcLock lock;
     if (localtime_r(&_tv.tv_sec, &out) != &out) std::abort();
 }
 

@@ -4,18 +4,23 @@
 
 #include <unistd.h>
 
+#include <atomic>
 #include <cerrno>
 #include <csignal>
 #include <cstdlib>
+#include <cstring>
 #include <functional>
 #include <memory>
+#include <new>
 #include <stdexcept>
 #include <string>
 #include <thread>
+#include <type_traits>
 #include <vector>
 
 #include "support/Child.h"
 #include "support/Faults.h"
+#include "support/Sweep.h"
 #include "util/Logger/EarlyLoggers.h"
 
 // What loggers do before Logger::initialize, when it binds them, and beyond main. Each test runs in
@@ -95,6 +100,34 @@ TEST(EarlyLoggersTest, ChecksWhetherALoggerIsUsable) {
               10);
 }
 
+TEST(EarlyLoggersTest, ALoggerIsNotLookedAtOnceItIsBound) {
+    const unsigned count = 100000 * testsupport::testScale();
+    const ChildResult result = runInChild([&] {
+        LogChannel::find("early", true)->changeLevel("DEBUG");
+        std::atomic<bool> built{false};
+        std::thread owner([&] {
+            std::vector<std::aligned_storage_t<sizeof(Logger), alignof(Logger)>> places(count);
+            for (auto& place : places)
+                new (&place) Logger("early");
+            built = true;
+            // The newest is bound first.
+            for (auto place = places.rbegin(); place != places.rend(); ++place) {
+                auto* const logger = reinterpret_cast<Logger*>(&*place);
+                while (!logger->isDebugEnabled()) {
+                }
+                logger->~Logger();
+                std::memset(static_cast<void*>(logger), 0x5A, sizeof *logger);
+            }
+        });
+        while (!built) {
+        }
+        Logger::initialize();
+        owner.join();
+        return 0;
+    });
+    EXPECT_EQ(result.status, 0) << result.signal;
+}
+
 TEST(EarlyLoggersTest, ExceptionsAndTextsAreNotInterpreted) {
     EXPECT_EQ(errOf([] {
                   Logger logger("a");
@@ -103,6 +136,24 @@ TEST(EarlyLoggersTest, ExceptionsAndTextsAreNotInterpreted) {
                   logger.crit(std::runtime_error("100%"));
               }),
               "%d\n%s %m\n100%\n");
+}
+
+TEST(EarlyLoggersTest, AnExceptionsTextMaySpoilErrno) {
+    struct Spoiling : std::exception {
+        const char* what() const noexcept override {
+            errno = EIO;
+            return "spoilt";
+        }
+    };
+    EXPECT_EQ(errOf([] {
+                  Logger logger("a");
+                  errno = ENOENT;
+                  logger.warn(Spoiling());
+                  EXPECT_EQ(errno, ENOENT);
+                  logger.debug(Spoiling());
+                  EXPECT_EQ(errno, ENOENT);
+              }),
+              "spoilt\n");
 }
 
 TEST(EarlyLoggersTest, PercentMIsTheErrnoOfTheCall) {

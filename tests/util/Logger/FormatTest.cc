@@ -2,10 +2,17 @@
 
 #include <gtest/gtest.h>
 
+#ifdef __GLIBC__
+#include <printf.h>
+#endif
+
+#include <algorithm>
 #include <cerrno>
+#include <cstdio>
 #include <cstring>
 #include <string>
 
+#include "support/Child.h"
 #include "support/Faults.h"
 
 namespace {
@@ -114,5 +121,29 @@ TEST(FormatTest, AConversionThatCannotSucceedShowsTheFormat) {
 TEST(FormatTest, NulCharactersAreKept) {
     EXPECT_EQ(formatted(0, "a%cb", 0), std::string("a\0b", 3));
 }
+
+#ifdef __GLIBC__
+
+// A conversion of our own: each of the first passes over the arguments finds a text that is longer
+// than the one before, as it does where another thread lengthens it.
+int printGrowing(FILE* stream, const struct printf_info*, const void* const*) {
+    static std::size_t passes = 0;
+    passes = std::min<std::size_t>(passes + 1, 4);
+    return fprintf(stream, "%s", std::string(300 * passes, 'g').c_str());
+}
+
+int noArguments(const struct printf_info*, std::size_t, int*, int*) {
+    return 0;
+}
+
+TEST(FormatTest, ATextThatGrowsBetweenThePassesIsWhole) {
+    const auto result = testsupport::runInChild([] {
+        register_printf_specifier('Y', printGrowing, noArguments);
+        return formatted(0, "<%Y>") == "<" + std::string(1200, 'g') + ">" ? 0 : 1;
+    });
+    EXPECT_EQ(result.status, 0) << result.signal;
+}
+
+#endif
 
 }  // namespace

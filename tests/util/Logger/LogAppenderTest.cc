@@ -5,6 +5,7 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
+#include <algorithm>
 #include <cerrno>
 #include <cstdlib>
 #include <sstream>
@@ -496,10 +497,182 @@ TEST_F(LogAppenderTest, TwoFailingAppendersDoNotReportIntoEachOtherForEver) {
         logger.warn("lost");
     });
     const std::string full = ": No space left on device\n";
-    // The message to full1 fails; its report fails in full2, whose report finds nobody left. Then
-    // the same the other way round.
-    EXPECT_EQ(err, "CRIT - Error writing to \"" + _dir.file("full2") + "\"" + full +
-                       "CRIT - Error writing to \"" + _dir.file("full1") + "\"" + full);
+    const std::string one = "CRIT - Error writing to \"" + _dir.file("full1") + "\"" + full;
+    const std::string two = "CRIT - Error writing to \"" + _dir.file("full2") + "\"" + full;
+    // The message to full1 fails; its report fails in full2, which is told first. Then the same the
+    // other way round.
+    EXPECT_EQ(err, two + one + one + two);
+}
+
+// The lines on standard error of one message to that many appenders that all fail, being those of
+// the channel "Logger" too.
+std::size_t linesOfFailingAppenders(int count, const TempDir& dir) {
+    const auto result = runInChild([&] {
+        std::string all;
+        for (int n = 0; n < count; ++n) {
+            const std::string name = "F" + std::to_string(n);
+            LogAppender::find(name, true)
+                ->setAttribute("fileName", dir.file("missing/" + name).c_str(), Pathname());
+            all += name + ",";
+        }
+        LogChannel::find("Logger", true)->setConfig(all.c_str());
+        LogChannel::find("net", true)->setConfig(all.c_str());
+        Logger::initialize();
+        Logger("net").warn("lost");
+        return 0;
+    });
+    EXPECT_EQ(result.status, 0);
+    return static_cast<std::size_t>(std::count(result.err.begin(), result.err.end(), '\n'));
+}
+
+TEST_F(LogAppenderTest, TheReportsOfManyFailingAppendersGrowWithTheirSquareAtMost) {
+    EXPECT_EQ(linesOfFailingAppenders(1, _dir), 1U);
+    EXPECT_EQ(linesOfFailingAppenders(3, _dir), 9U);
+    EXPECT_EQ(linesOfFailingAppenders(9, _dir), 81U);
+    EXPECT_EQ(linesOfFailingAppenders(20, _dir), 400U);
+}
+
+TEST_F(LogAppenderTest, AReportThatOnlyFailingAppendersWereOfferedGoesToStandardError) {
+    const std::string err = errOf([&] {
+        for (const char* name : {"F", "G"}) {
+            LogAppender::find(name, true)
+                ->setAttribute("fileName", _dir.file(std::string("missing/") + name).c_str(),
+                               Pathname());
+        }
+        LogChannel::find("Logger", true)->setConfig("G");
+        LogChannel::find("net", true)->setConfig("F");
+        Logger::initialize();
+        Logger("net").warn("lost");
+    });
+    const auto told = [&](const char* name) {
+        return "ERROR - Error opening \"" + _dir.file(std::string("missing/") + name) +
+               "\": No such file or directory\n";
+    };
+    EXPECT_EQ(err, told("G") + told("F"));
+}
+
+TEST_F(LogAppenderTest, EachFailureIsToldOnceToAnAppenderThatWorks) {
+    EXPECT_EQ(errOf([&] {
+                  for (const char* name : {"F", "G"}) {
+                      LogAppender::find(name, true)
+                          ->setAttribute("fileName",
+                                         _dir.file(std::string("missing/") + name).c_str(),
+                                         Pathname());
+                  }
+                  LogAppender::find("W", true)->setAttribute("fileName", _file.c_str(), Pathname());
+                  LogChannel::find("Logger", true)->setConfig("G,F,W");
+                  LogChannel::find("net", true)->setConfig("F");
+                  Logger::initialize();
+                  Logger("net").warn("lost");
+              }),
+              "");
+    const auto told = [&](const char* name) {
+        return "Error opening \"" + _dir.file(std::string("missing/") + name) +
+               "\": No such file or directory\n";
+    };
+    EXPECT_EQ(content(), told("G") + told("F"));
+}
+
+TEST_F(LogAppenderTest, AnAppenderThatRecoversIsTriedAgainByTheNextMessage) {
+    EXPECT_EQ(errOf([&] {
+                  LogAppender* const bad = LogAppender::find("bad", true);
+                  bad->setAttribute("fileName", _file.c_str(), Pathname());
+                  LogChannel::find("Logger", true)->setConfig("bad");
+                  Logger::initialize();
+                  {
+                      const FailNth fault(Call::open, 1, EACCES);
+                      Logger("Logger").warn("lost");
+                      EXPECT_TRUE(fault.fired());
+                  }
+                  LogFormat::internal(nullptr, WARN, "kept");
+              }),
+              "ERROR - Error opening \"" + _file + "\": Permission denied\n");
+    EXPECT_EQ(content(), "kept\n");
+}
+
+TEST_F(LogAppenderTest, ALineThatWasCutCountsAndRotatesAFullFile) {
+    set("fileName", _file);
+    set("maxFileSize", "10");
+    set("maxBackupIndex", "1");
+    EXPECT_EQ(errOf([&] {
+                  log("12345678");  // 9 bytes with the newline
+                  const ShortNth cut(Call::write, 1, 2, EFBIG);
+                  log("abcdef");
+              }),
+              "Error writing to \"" + _file + "\": File too large\n");
+    EXPECT_EQ(readFile(_file + ".1"), "12345678\nab");
+    EXPECT_EQ(content(), "");
+}
+
+TEST_F(LogAppenderTest, ALineThatWasCutAtTheLimitDoesNotRotate) {
+    set("fileName", _file);
+    set("maxFileSize", "11");
+    set("maxBackupIndex", "1");
+    errOf([&] {
+        log("12345678");
+        const ShortNth cut(Call::write, 1, 2, EFBIG);
+        log("abcdef");
+    });
+    EXPECT_EQ(content(), "12345678\nab");
+    EXPECT_EQ(_dir.names().size(), 1U);
+}
+
+TEST_F(LogAppenderTest, AFailedRotationBehindALineThatWasCutIsToldToo) {
+    set("fileName", _file);
+    set("maxFileSize", "1");
+    EXPECT_EQ(errOf([&] {
+                  const ShortNth cut(Call::write, 1, 2, EFBIG);
+                  const FailNth closed(Call::open, 2, EMFILE);
+                  log("abcdef");
+              }),
+              "Error writing to \"" + _file + "\": File too large\nError opening \"" + _file +
+                  "\": Too many open files\n");
+}
+
+TEST_F(LogAppenderTest, ADescriptorThatWasHandedInIsNeverClosed) {
+    int ends[2];
+    ASSERT_EQ(pipe(ends), 0);
+    {
+        LogAppender appender{FileDescriptor(ends[1])};
+        appender.setAttribute("fileName", _file.c_str(), Pathname());
+        appender.write(LogMsgMetadata(&_logger, INFO), "x");
+    }
+    EXPECT_EQ(content(), "x\n");
+    EXPECT_NE(fcntl(ends[1], F_GETFD), -1);
+    close(ends[0]);
+    close(ends[1]);
+}
+
+TEST_F(LogAppenderTest, WithoutALayoutTheRootAppendersAtTheTimeOfTheLineIsUsed) {
+    EXPECT_EQ(errOf([&] {
+                  LogAppender appender{FileDescriptor(STDERR_FILENO)};
+                  appender.write(LogMsgMetadata(&_logger, INFO), "x");
+                  LogAppender::find("rootAppender", false)
+                      ->setAttribute("layout", "SimpleLayout", Pathname());
+                  appender.write(LogMsgMetadata(&_logger, INFO), "x");
+              }),
+              "x\nINFO    : x\n");
+}
+
+// The warning of the one is the first line of the other.
+TEST_F(LogAppenderTest, ATestOpenLeavesNoOtherDescriptorBehind) {
+    EXPECT_EQ(errOf([&] {
+                  LogAppender* const a = LogAppender::find("A", true);
+                  LogAppender* const b = LogAppender::find("B", true);
+                  a->setAttribute("maxBackupIndex", "1", Pathname());
+                  a->setAttribute("fileName", _dir.file("a").c_str(), Pathname());
+                  b->setAttribute("fileName", _file.c_str(), Pathname());
+                  LogChannel::find("Logger", true)->setConfig("B");
+                  Logger::initialize();
+                  const CountCalls opens(Call::open);
+                  const CountCalls closes(Call::close);
+                  a->finalSetup("A");
+                  b->finalSetup("B");
+                  EXPECT_EQ(opens.count(), 3U);
+                  EXPECT_EQ(closes.count(), 3U);
+              }),
+              "");
+    EXPECT_THAT(content(), testing::HasSubstr("maxBackupIndex set without specifying maxSize"));
 }
 
 TEST_F(LogAppenderTest, AReportGoesToTheOtherAppendersOfTheChannelLogger) {

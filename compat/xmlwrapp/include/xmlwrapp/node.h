@@ -1,48 +1,10 @@
 #pragma once
+// #include_next is no standard C++, which this lets a strict compiler pass over.
+#pragma GCC system_header
 
-// Stands in for xmlwrapp's node where that library is not installed: the part of it that Korvex
-// uses, over the real libxml2. This folder is on the include path only then. The inner namespace
-// keeps the two apart in a program that links both.
-
-#include <korvex/Export.h>
-
-struct _xmlNode;
-
-namespace xml {
-inline namespace KORVEX_EXPORT korvex_compat {
-
-// One XML element: a name and its text. A value; copies are deep. Names and contents are
-// NUL-terminated UTF-8 and are copied. Running out of memory throws std::bad_alloc. As thread-safe
-// as a std::string, but for get_content().
-class node {
-  public:
-    // An element named "blank".
-    node();
-    explicit node(const char* name);
-    node(const char* name, const char* content);
-    node(const node& other);
-    node& operator=(const node& other);
-    ~node();
-
-    void swap(node& other) noexcept;
-
-    void set_name(const char* name);
-    // Valid until the name changes or the node goes.
-    const char* get_name() const;
-    // The text as it stands: no entity in it is interpreted.
-    void set_content(const char* content);
-    // The text, "" when there is none. Valid until the next call, a change, or the node's end; so
-    // not for two threads at once.
-    const char* get_content() const;
-
-  private:
-    _xmlNode* _node;
-    mutable unsigned char* _content = nullptr;  // what get_content() gave away
-};
-
-inline void swap(node& a, node& b) noexcept {
-    a.swap(b);
-}
-
-}  // namespace korvex_compat
-}  // namespace xml
+// For programs that ask for xmlwrapp's header by its own name: xmlwrapp's, if it is there.
+#if __has_include_next(<xmlwrapp/node.h>)
+#include_next <xmlwrapp/node.h>
+#else
+#include <korvex-compat/XmlNode.h>
+#endif

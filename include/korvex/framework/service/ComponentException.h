@@ -5,7 +5,7 @@
 #include <stdexcept>
 #include <string>
 
-inline namespace KORVEX_EXPORT korvex {
+KORVEX_NAMESPACE(korvex) {
 
 class Logger;
 
@@ -21,4 +21,4 @@ class ComponentException : public std::runtime_error {
     ~ComponentException() override;
 };
 
-}  // namespace korvex
+}  // KORVEX_NAMESPACE(korvex)

@@ -13,7 +13,7 @@
 #include <string>
 #include <vector>
 
-inline namespace KORVEX_EXPORT korvex {
+KORVEX_NAMESPACE(korvex) {
 
 class LogFormat;
 class LogMsgMetadata;
@@ -44,7 +44,8 @@ class LogAppender {
     // is unknown or the value unacceptable.
     //
     //   fileName                  any path; a leading "${KORVEX_HOME}" becomes korvexHome unless
-    //                             that is empty. Closes the file in use.
+    //                             that is empty. Closes the file in use; a descriptor
+    //                             that was handed in is let go, not closed.
     //   maxFileSize               bytes beyond which the file is rotated; 0: never. isValidUint().
     //   maxBackupIndex            how many numbered backups are kept. isValidUint(); a number
     //                             beyond 32 bits counts as 4294967295.
@@ -70,22 +71,26 @@ class LogAppender {
     const Pathname& fileName() const { return _filename; }  // empty: none
     std::int64_t maxFileSize() const { return _maxSize; }   // bytes; 0 and below: never rotated
     std::uint32_t maxBackupIndex() const { return _maxBackupIndex; }
-    const LogFormat& layout() const;  // "%m%n" until one is set
+    const LogFormat& layout() const;  // the root appender's until one is set
 
     // Lays the message out and writes it with one write(2), after that rotating a file that has
     // grown beyond its limit. Every five seconds of message time the file's identity is checked
     // (device and inode), so that a file moved away is left and a new one made. Failures, a line
     // that could be written only in part among them, are reported through LogFormat::internal once
-    // the lock is released; the message is lost then, and the next one opens the file again. Takes
-    // no notice of a lock that fails. Throws what LogFormat::apply throws.
+    // the lock is released; the message is lost then, and the next one opens the file again. What
+    // was written of such a line counts towards the limit. Takes no notice of a lock that fails.
+    // Throws what LogFormat::apply throws.
     void write(const LogMsgMetadata& mdata, const std::string& msg);
 
   private:
     class Report;
 
+    friend class LogChannel;
     friend class LoggingLocks;
 
-    void writeLine(const std::string& line, long long now, Report& report) KORVEX_REQUIRES(_mutex);
+    // write(), and whether all of the line was written.
+    bool tryWrite(const LogMsgMetadata& mdata, const std::string& msg);
+    bool writeLine(const std::string& line, long long now, Report& report) KORVEX_REQUIRES(_mutex);
     void checkIdentity(long long now) KORVEX_REQUIRES(_mutex);
     bool openFile(Report& report) KORVEX_REQUIRES(_mutex);
     bool openAndInitFile(long long now, Report& report) KORVEX_REQUIRES(_mutex);
@@ -108,6 +113,7 @@ class LogAppender {
     long long _lastCheck KORVEX_GUARDED_BY(_mutex) = 0;
     // Whether write() holds the lock just now: a hint to those about to wait for it.
     std::atomic<bool> _writing{false};
+    bool _registered = false;  // made by find(), so the lock is taken before a fork
 };
 
-}  // namespace korvex
+}  // KORVEX_NAMESPACE(korvex)

@@ -7,7 +7,7 @@
 #include <string>
 #include <vector>
 
-inline namespace KORVEX_EXPORT korvex {
+KORVEX_NAMESPACE(korvex) {
 
 class LogAppender;
 class LogMsgMetadata;
@@ -57,8 +57,8 @@ class LogChannel {
     // LogAppender::write throws.
     void write(const LogMsgMetadata& mdata, const std::string& msg);
 
-    // The same, except to dont_touch and to the appenders for which this thread is reporting a
-    // failure just now. Returns whether an appender received it.
+    // The same, except to dont_touch and to the appenders that have failed in the report that this
+    // thread is delivering. Returns whether an appender has written all of it.
     bool write(const LogMsgMetadata& mdata, const std::string& msg, const LogAppender* dont_touch);
 
   private:
@@ -68,4 +68,4 @@ class LogChannel {
     std::vector<LogAppender*> _appenders;  // not owned; empty: the root appender
 };
 
-}  // namespace korvex
+}  // KORVEX_NAMESPACE(korvex)

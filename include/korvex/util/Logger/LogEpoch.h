@@ -3,11 +3,11 @@
 #include <korvex/Export.h>
 #include <korvex/util/Timeval.h>
 
-inline namespace KORVEX_EXPORT korvex {
+KORVEX_NAMESPACE(korvex) {
 
 // The moment from which the layouts' %r and %R count: when logging was initialised, or the first
 // call of this function if that came earlier. The same object every time, never destroyed; safe
 // from any thread. Aborts when the clock fails, as Timeval does.
 KORVEX_EXPORT const Timeval& epoch_timeval();
 
-}  // namespace korvex
+}  // KORVEX_NAMESPACE(korvex)

@@ -8,11 +8,12 @@
 #include <string>
 #include <vector>
 
-inline namespace KORVEX_EXPORT korvex {
+KORVEX_NAMESPACE(korvex) {
 
 class CachedTm;
 class LayoutPieces;
 class LogAppender;
+class LogChannel;
 class LogFormattedDate;
 class LogMsgMetadata;
 class Logger;
@@ -46,7 +47,8 @@ class LogFormat {
     const std::string& pattern() const { return _fmt; }
 
     // The way of every message: level test, metadata, the logger's channel; standard error when
-    // the logger is not usable yet or its channel throws. Never throw, keep errno. The second form
+    // the logger is not usable yet, its channel throws, or this is a signal handler that
+    // interrupted its own thread in logging. Never throw, keep errno. The second form
     // formats as Logger::vformat does, %m being the errno at the call, and only when the level has
     // passed; a message whose formatting runs out of memory is dropped.
     static void do_log(Logger* logger, LogLevel level, const std::string& text) noexcept;
@@ -54,8 +56,9 @@ class LogFormat {
         __attribute__((format(printf, 3, 0)));
 
     // Logs one of the logging system's own messages on the channel "Logger". Neither `skip` (null
-    // for none) nor any other appender for which this thread is already reporting a failure
-    // receives it; when no appender is left it goes to standard error. Never throws, keeps errno.
+    // for none) nor an appender that has failed in the report that this thread is delivering
+    // already receives it; what no appender could write goes to standard error. Never throws,
+    // keeps errno.
     static void internal(const LogAppender* skip, LogLevel level, const char* fmt, ...) noexcept
         __attribute__((format(printf, 3, 4)));
 
@@ -91,6 +94,10 @@ class LogFormat {
     class Line;
     friend class LayoutPieces;  // lays the atoms open, for the tools
 
+    // Whether anybody wants such a message, and in *taker who: a channel, or null for standard
+    // error.
+    static bool findTaker(const Logger& logger, LogLevel level, LogChannel*& taker);
+
     Atom* new_atom();
 
     std::string _fmt;
@@ -98,4 +105,4 @@ class LogFormat {
     std::list<LogFormattedDate> _dates;
 };
 
-}  // namespace korvex
+}  // KORVEX_NAMESPACE(korvex)

@@ -6,7 +6,7 @@
 #include <string>
 #include <vector>
 
-inline namespace KORVEX_EXPORT korvex {
+KORVEX_NAMESPACE(korvex) {
 
 class LayoutPieces;
 class LogMsgMetadata;
@@ -65,4 +65,4 @@ class LogFormattedDate {
     std::vector<Atom> _atoms;
 };
 
-}  // namespace korvex
+}  // KORVEX_NAMESPACE(korvex)

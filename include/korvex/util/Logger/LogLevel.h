@@ -25,7 +25,7 @@
 #undef FATAL
 #undef EMERG
 
-inline namespace KORVEX_EXPORT korvex {
+KORVEX_NAMESPACE(korvex) {
 
 // How grave a message is. A message passes a channel when its level is greater than or equal to
 // the channel's minimum. Logger has no methods for NOTICE, ALERT and EMERG: they serve as minima.
@@ -45,7 +45,7 @@ enum LogLevel : int {
 // to *len, which must not be null. The text lives for ever. Never fails; safe from any thread.
 KORVEX_EXPORT const char* loglevel2str(unsigned long* len, LogLevel level);
 
-}  // namespace korvex
+}  // KORVEX_NAMESPACE(korvex)
 
 #pragma pop_macro("DEBUG")
 #pragma pop_macro("INFO")

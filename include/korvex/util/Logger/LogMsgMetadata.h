@@ -4,7 +4,7 @@
 #include <korvex/util/Logger/LogLevel.h>
 #include <korvex/util/Timeval.h>
 
-inline namespace KORVEX_EXPORT korvex {
+KORVEX_NAMESPACE(korvex) {
 
 class Logger;
 
@@ -20,4 +20,4 @@ class LogMsgMetadata {
     LogLevel level;          // how grave it is
 };
 
-}  // namespace korvex
+}  // KORVEX_NAMESPACE(korvex)

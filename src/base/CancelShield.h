@@ -1,0 +1,20 @@
+#pragma once
+
+#include <pthread.h>
+
+inline namespace korvex {
+
+// Puts off pthread_cancel(3) of the calling thread for a scope that must not be left half done, or
+// that promises not to throw, as a cancellation does.
+class CancelShield {
+  public:
+    CancelShield() { pthread_setcancelstate(PTHREAD_CANCEL_DISABLE, &_before); }
+    CancelShield(const CancelShield&) = delete;
+    CancelShield& operator=(const CancelShield&) = delete;
+    ~CancelShield() { pthread_setcancelstate(_before, nullptr); }
+
+  private:
+    int _before = PTHREAD_CANCEL_ENABLE;
+};
+
+}  // namespace korvex
