@@ -88,9 +88,10 @@ class Search {
         RecordFrame frame;
         Key key;
         std::vector<std::uint64_t> passed;
+        std::unordered_set<std::uint64_t>& dead = enough == kEnough ? _tooFew : _notToEnd;
         for (unsigned count = 0; count < enough || place <= _at; ++count) {
-            if (!read(place, before, frame, key) || wasRead(place) || _dead.count(place) > 0) {
-                _dead.insert(passed.begin(), passed.end());
+            if (!read(place, before, frame, key) || wasRead(place) || dead.count(place) > 0) {
+                dead.insert(passed.begin(), passed.end());
                 return false;
             }
             passed.push_back(place);
@@ -239,7 +240,8 @@ class Search {
     Key _lastKey;
     // From these places records follow on each other, but not far enough. Without them a file whose
     // values are in order, as its keys are, would be walked through from each of its values.
-    mutable std::unordered_set<std::uint64_t> _dead;
+    mutable std::unordered_set<std::uint64_t> _notToEnd;
+    mutable std::unordered_set<std::uint64_t> _tooFew;
 };
 
 }  // namespace
