@@ -412,13 +412,13 @@ TEST_F(RecordFileManagerTest, APipeIsReadLikeAFile) {
     for (const std::size_t size : {0U, 1000U, 4095U, 4096U, 4097U, 100000U}) {
         const std::string content = kVersionRecord + record("a", std::string(size, 'x'));
         ASSERT_EQ(mkfifo(_file.c_str(), 0600), 0);
-        std::thread writer([&] { writeFile(_file, content); });
         EXPECT_EQ(run([&] {
+                      std::thread writer([&] { writeFile(_file, content); });
                       store().readFile();
+                      writer.join();
                       if (get("a") == std::string(size, 'x')) fputs("ok", stdout);
                   }),
                   "");
-        writer.join();
         EXPECT_EQ(_out, "ok") << size;
         ASSERT_EQ(unlink(_file.c_str()), 0);
     }
@@ -438,15 +438,15 @@ TEST_F(RecordFileManagerTest, AFileWhoseSizeIsNotToldIsReadAllTheSame) {
 
 TEST_F(RecordFileManagerTest, APipeThatEndsInAValueIsTold) {
     ASSERT_EQ(mkfifo(_file.c_str(), 0600), 0);
-    std::thread writer(
-        [&] { writeFile(_file, u32(1) + "a" + u32(9000) + std::string(8500, 'x')); });
     EXPECT_EQ(run([&] {
+                  std::thread writer(
+                      [&] { writeFile(_file, u32(1) + "a" + u32(9000) + std::string(8500, 'x')); });
                   fputs(thrownBy([] { store().readFile(); }).c_str(), stdout);
+                  writer.join();
                   if (get("a") == std::string(8500, 'x') + std::string(500, '\0'))
                       fputs("ok", stdout);
               }),
               kShort + kNoVersion + "\n");
-    writer.join();
     EXPECT_EQ(_out, kNoVersion + std::string("ok"));
 }
 

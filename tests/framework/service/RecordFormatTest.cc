@@ -1,8 +1,8 @@
 #include "framework/service/RecordFileManager/RecordFormat.h"
 
 #include <gtest/gtest.h>
-#include <strings.h>
 
+#include <cctype>
 #include <clocale>
 #include <cstdlib>
 #include <string>
@@ -46,7 +46,7 @@ TEST(RecordFormatTest, AVersionKeyIsTheSameInTurkey) {
     const auto result = runInChild([&] {
         setenv("LOCPATH", dir.path().c_str(), 1);
         if (std::setlocale(LC_ALL, "tr_TR.ISO-8859-9") == nullptr) return 1;
-        if (strncasecmp("FILE", "file", 4) == 0) return 2;  // not as in Turkey
+        if (std::tolower('I') == 'i') return 2;  // not as in Turkey
         return isVersionKey("_RECORD-FILE-VERSION") ? 0 : 3;
     });
     EXPECT_EQ(result.status, 0);
