@@ -5,7 +5,10 @@
 there() {
     dpkg-query -W -f '${Status}\n' "$1" 2> /dev/null | grep -q 'ok installed' && return
     case $1 in
+        acl) command -v setfacl ;;
+        locales) command -v locale-gen ;;
         ninja-build) command -v ninja ;;
+        libpcre2-dev) pkg-config --exists libpcre2-8 ;;
         libpopt-dev) pkg-config --exists popt ;;
         libxml2-dev) pkg-config --exists libxml-2.0 ;;
         libgtest-dev) pkg-config --exists gtest ;;

@@ -307,7 +307,7 @@ TEST_F(KorvexLogcheckTest, SeveralFilesDoNotMixAndTheWorstOneIsTheStatus) {
 
 TEST_F(KorvexLogcheckTest, AFileWithoutAnEndIsNoConfiguration) {
     const ChildResult result = run({"/dev/zero"});
-    EXPECT_EQ(result.err, "korvex-logcheck: cannot read /dev/zero: it is larger than 16 MiB\n");
+    EXPECT_EQ(result.err, "korvex-logcheck: cannot read /dev/zero: it is larger than 1 MiB\n");
     EXPECT_EQ(result.status, 2);
 }
 

@@ -147,7 +147,13 @@ TEST_F(LogcheckPathsTest, TheUsersGroupsCount) {
     ASSERT_EQ(chmod((log + "/a.log").c_str(), 0660), 0);
     EXPECT_THAT(told(log + "/a.log"), IsEmpty());
     ASSERT_EQ(chown((log + "/a.log").c_str(), 0, 0), 0);
-    EXPECT_THAT(told(log + "/a.log"), ElementsAre(HasSubstr("[path.denied]")));
+    const ChildResult result = runInChild([&] {
+        const gid_t roots = 0;
+        if (setgroups(1, &roots) != 0) return 1;
+        execLogcheck({"-q", "--paths", "--user", "nobody", file});
+        return 127;
+    });
+    EXPECT_THAT(result.out, HasSubstr("[path.denied]"));
 }
 
 TEST_F(LogcheckPathsTest, EachAppendersProblemStandsAtItsOwnLine) {

@@ -1,4 +1,5 @@
 #include <gmock/gmock.h>
+#include <korvex/util/Logger.h>
 
 #include <string>
 #include <vector>
@@ -58,6 +59,29 @@ TEST_F(LogcheckPatternsTest, ConversionsThatThereAreNot) {
     EXPECT_THAT(told("%3%m%m%n"), ElementsAre("1: " + nothing("%3%") + code));
     EXPECT_THAT(told("%- 5p%m%n"), ElementsAre("1: " + nothing("%- ") + code));
     EXPECT_EQ(mended("%-5P %C %x%N %m%n"), "%-5p %C %x%n %m%n");
+}
+
+// The library and the tool know the same letters.
+TEST_F(LogcheckPatternsTest, TheLettersAreThoseOfTheLibrary) {
+    const Logger logger("channel");
+    const LogMsgMetadata md(&logger, WARN);
+    std::string all;
+    std::vector<std::string> expected;
+    for (char letter = 'A'; letter <= 'z'; ++letter) {
+        if (letter > 'Z' && letter < 'a') continue;
+        const std::string conversion = std::string("%") + letter;
+        std::string line;
+        LogFormat(conversion.c_str()).apply(line, md, "message");
+        if (line.empty()) expected.push_back(nothing(conversion));
+        all += conversion + ' ';
+    }
+    EXPECT_EQ(expected.size(), 52U - 9U);
+    std::vector<std::string> got;
+    for (const std::string& line : told(all + "%n")) {
+        const std::string text = line.substr(line.find(' ') + 1);
+        got.push_back(text.substr(0, text.find("nothing") + 7));
+    }
+    EXPECT_EQ(got, expected);
 }
 
 TEST_F(LogcheckPatternsTest, ConversionsSpeltOut) {

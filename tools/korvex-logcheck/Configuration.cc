@@ -100,13 +100,14 @@ Configuration Configuration::read(const std::string& text, const Pathname& home)
     reader.applyCategories();
     for (Appender& appender : config.appenders)
         appender.complaints = LogAppender::find(appender.name, false)->settle();
-    config.parseErrors = reader.parse_errors();
+    for (const DeferedLogConf& error : reader.parse_errors())
+        config.parseErrors.emplace(error.lineno, error.context);
     config.openComment = reader.xml_comment_startline();
     return config;
 }
 
 bool Configuration::hasAppender(const std::string& name) const {
-    return name == rootAppender.name || named(appenders, name) != nullptr;
+    return LogAppender::find(name, false) != nullptr;
 }
 
 const Appender* Configuration::appenderOf(const LogAppender* made) const {
@@ -142,11 +143,6 @@ std::vector<const ConfigStatement*> Configuration::appliedValues() const {
             all.push_back(&said);
     }
     return all;
-}
-
-bool Configuration::isRefused(unsigned lineno) const {
-    return std::any_of(parseErrors.begin(), parseErrors.end(),
-                       [=](const DeferedLogConf& error) { return error.lineno == lineno; });
 }
 
 std::vector<std::string> Configuration::users(const LogAppender& appender) const {

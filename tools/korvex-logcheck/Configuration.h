@@ -2,6 +2,7 @@
 
 #include <korvex/util/Logger.h>
 
+#include <map>
 #include <string>
 #include <vector>
 
@@ -41,16 +42,16 @@ struct Configuration {
     std::vector<const Appender*> everyAppender() const;
     // The lines that set the root's level and appenders, and the categories'.
     std::vector<const ConfigStatement*> appliedValues() const;
-    bool isRefused(unsigned lineno) const;
+    bool isRefused(unsigned lineno) const { return parseErrors.count(lineno) > 0; }
     // The names of the channels that write to it.
     std::vector<std::string> users(const LogAppender& appender) const;
     // "MAIN", or "rootAppender".
     std::string nameOf(const LogAppender* made) const;
 
     Channel root;
-    std::vector<Channel> categories;  // in the order in which they come into being
-    std::vector<Appender> appenders;  // in the file's order
-    Appender rootAppender;            // not among the others
-    DeferedLogConfList parseErrors;
-    unsigned openComment = ConfigLines::kNone;  // the line of a comment that never ends
+    std::vector<Channel> categories;              // in the order in which they come into being
+    std::vector<Appender> appenders;              // in the file's order
+    Appender rootAppender;                        // not among the others
+    std::map<unsigned, std::string> parseErrors;  // by line: what the library quotes
+    unsigned openComment = ConfigLines::kNone;    // the line of a comment that never ends
 };

@@ -9,7 +9,7 @@
 
 namespace {
 
-constexpr std::size_t kMost = 16U << 20U;  // of no configuration, but of a device without an end
+constexpr std::size_t kMost = 1U << 20U;  // of no configuration, but of a device without an end
 
 [[noreturn]] void unreadable(const std::string& name, const std::string& why) {
     throw Failure("cannot read " + printable(name) + ": " + why);
@@ -20,7 +20,7 @@ std::string readAll(std::FILE* file, const std::string& name) {
     char buf[65536];
     while (const std::size_t n = std::fread(buf, 1, sizeof buf, file)) {
         bytes.append(buf, n);
-        if (bytes.size() > kMost) unreadable(name, "it is larger than 16 MiB");
+        if (bytes.size() > kMost) unreadable(name, "it is larger than 1 MiB");
     }
     if (std::ferror(file) != 0) unreadable(name, std::strerror(errno));
     return bytes;

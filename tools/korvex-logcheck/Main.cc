@@ -10,6 +10,7 @@
 #include "Output.h"
 #include "Report.h"
 #include "Text.h"
+#include "export/Export.h"
 #include "support/StandardOutput.h"
 
 namespace {
@@ -54,6 +55,21 @@ Status fix(const Options& options, const std::string& file) {
     return statusOf(left);
 }
 
+// What would be exported of a configuration with errors would be a guess.
+void exportOnly(const Options& options) {
+    if (options.engine == "list") {
+        listEngines();
+        return;
+    }
+    const std::string& file = options.files.front();
+    const Source source(readInput(file));
+    if (statusOf(findAll(source, wantedBy(options))) == ERRORS) {
+        throw Failure(printable(file) + " has errors; korvex-logcheck shows them without --export");
+    }
+    exportTo(options.engine, Configuration::read(source.bytes(), options.home), Pathname(file),
+             options.appender);
+}
+
 void complain(const std::exception& e) {
     std::fprintf(stderr, "korvex-logcheck: %s\n", e.what());
 }
@@ -80,6 +96,8 @@ Status run(int argc, char** argv) {
     Status status = CLEAN;
     if (options.mode == Options::CODES) {
         writeCodes();
+    } else if (options.mode == Options::EXPORT) {
+        exportOnly(options);
     } else if (options.mode == Options::FIX) {
         status = fix(options, options.files.front());
     } else {

@@ -17,7 +17,9 @@ enum Action {
     FIX = 'f',
     JSON = 'j',
     CODES = 'C',
-    QUIET = 'q'
+    QUIET = 'q',
+    EXPORT = 'x',
+    APPENDER = 'a'
 };
 
 const poptOption optionTable[] = {
@@ -32,6 +34,10 @@ const poptOption optionTable[] = {
     {"json", '\0', POPT_ARG_NONE, nullptr, JSON, "show the findings only, as JSON", nullptr},
     {"quiet", 'q', POPT_ARG_NONE, nullptr, QUIET, "show the findings only", nullptr},
     {"codes", '\0', POPT_ARG_NONE, nullptr, CODES, "show what can be found", nullptr},
+    {"export", '\0', POPT_ARG_STRING, nullptr, EXPORT,
+     "write what this engine needs to read the log files; \"list\" shows the engines", "ENGINE"},
+    {"appender", '\0', POPT_ARG_STRING, nullptr, APPENDER,
+     "with --export: for the file of this one only", "NAME"},
     {"version", '\0', POPT_ARG_NONE, nullptr, VERSION, "show the version", nullptr},
     {"help", '?', POPT_ARG_NONE, nullptr, HELP, "show this text", nullptr},
     {nullptr, '\0', 0, nullptr, 0, nullptr, nullptr},
@@ -40,7 +46,7 @@ const poptOption optionTable[] = {
 // Of those that change the whole output, one.
 void choose(Options::Mode mode, Options& options) {
     const bool other = options.mode != Options::REPORT && options.mode != mode;
-    if (other) throw Failure("one of --fix, --json, --quiet and --codes");
+    if (other) throw Failure("one of --fix, --json, --quiet, --codes and --export");
     options.mode = mode;
 }
 
@@ -53,6 +59,11 @@ void act(int action, const CommandLine& line, Options& options) {
     if (action == JSON) choose(Options::JSON, options);
     if (action == QUIET) choose(Options::FINDINGS, options);
     if (action == CODES) choose(Options::CODES, options);
+    if (action == EXPORT) {
+        choose(Options::EXPORT, options);
+        options.engine = line.argument();
+    }
+    if (action == APPENDER) options.appender = line.argument();
     if (action == HELP) line.showHelp();
     if (action == VERSION) line.showVersion();
 }
@@ -60,15 +71,23 @@ void act(int action, const CommandLine& line, Options& options) {
 void check(const Options& options) {
     if (options.user && !options.paths) throw Failure("--user goes with --paths");
     if (options.channel && options.mode != Options::REPORT) {
-        throw Failure("--channel does not go with --fix, --json, --quiet and --codes");
+        throw Failure("--channel does not go with --fix, --json, --quiet, --codes and --export");
     }
-    if (options.mode == Options::CODES) {
-        if (!options.files.empty()) throw Failure("--codes takes no file");
+    if (options.appender && options.mode != Options::EXPORT) {
+        throw Failure("--appender goes with --export");
+    }
+    const bool listsOnly = options.mode == Options::EXPORT && options.engine == "list";
+    if (options.mode == Options::CODES || listsOnly) {
+        if (!options.files.empty()) {
+            throw Failure(listsOnly ? "--export list takes no file" : "--codes takes no file");
+        }
         return;
     }
     if (options.files.empty()) throw Failure("no configuration file given; see --help");
-    if (options.mode == Options::FIX && options.files.size() > 1) {
-        throw Failure("--fix takes one file at a time");
+    const bool takesOne = options.mode == Options::FIX || options.mode == Options::EXPORT;
+    if (takesOne && options.files.size() > 1) {
+        throw Failure(options.mode == Options::FIX ? "--fix takes one file at a time"
+                                                   : "--export takes one file at a time");
     }
 }
 

@@ -1,10 +1,19 @@
 #pragma once
 
+#include <sys/types.h>
+
 #include <string>
 
-// One file by one name: normalised, and links followed as far as there are any.
-std::string canonicalName(const std::string& name);
+// What a name of a file leads to.
+struct FileIdentity {
+    std::string canonical;  // normalised, and links followed as far as there are any
+    bool isDevice;          // or anything else that takes lines from any number
+    bool exists;
+    dev_t device;
+    ino_t inode;
+};
 
-// Whether two names are those of one file, by whatever spelling or link. A device is none: it takes
-// lines from any number.
-bool isSameFile(const std::string& a, const std::string& b);
+FileIdentity identityOf(const std::string& name);
+
+// Whether two names are those of one file, by whatever spelling or link. A device is none.
+bool isSameFile(const FileIdentity& a, const FileIdentity& b);

@@ -9,6 +9,7 @@
 
 #include "PathAccess.h"
 #include "Status.h"
+#include "Text.h"
 
 namespace {
 
@@ -62,7 +63,7 @@ std::string readAll(int from) {
 }
 
 [[noreturn]] void refuse(const std::string& user, const std::string& why) {
-    throw Failure("cannot look as user " + user + ": " + why);
+    throw Failure("cannot look as user " + printable(user) + ": " + why);
 }
 
 }  // namespace

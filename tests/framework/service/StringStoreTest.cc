@@ -224,7 +224,7 @@ TEST_F(StringStoreTest, AnyThreadAndAnyChildMayDoAnything) {
                 thread.join();
             return well && store.save();
         },
-        60 * testScale());
+        110 * testScale());
     run([](StringStore store) { return store.list().size() == 1 && store.get("shared"); });
 }
 

@@ -52,8 +52,8 @@ void checkFile(const Reading& reading, const Appender& appender, Findings& to) {
 
 // Whether a line that is refused was surely to use it. That line is told, so this is not.
 bool isMeantToBeUsed(const Reading& reading, const Appender& appender, const Findings& told) {
-    for (const DeferedLogConf& error : reading.config.parseErrors) {
-        const std::string& line = reading.source.line(error.lineno).text;
+    for (const auto& [lineno, text] : reading.config.parseErrors) {
+        const std::string& line = reading.source.line(lineno).text;
         const std::size_t sign = line.find_first_of("=:");
         if (sign == line.npos || line.find("appender.") < sign) continue;
         const std::vector<std::string> words = wordsOf(std::string_view(line).substr(sign + 1));

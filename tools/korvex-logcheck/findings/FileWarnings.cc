@@ -21,30 +21,35 @@ std::uint64_t backupNumber(const std::string& name, const std::string& of) {
     return number ? std::stoull(digits) : 0;
 }
 
-void checkShared(const Configuration& config, const Appender& appender, const Place& place,
-                 Findings& to) {
-    const std::string& name = appender.made->fileName();
-    for (const Appender& other : config.appenders) {
-        if (&other == &appender) return;
-        const std::string& otherName = other.made->fileName();
-        if (otherName.empty() || !isSameFile(name, otherName)) continue;
+// An appender that writes to a file.
+struct FileUser {
+    const Appender* appender;
+    Piece value;  // of its fileName
+    FileIdentity file;
+};
+
+void checkShared(const std::vector<FileUser>& users, const FileUser& user, Findings& to) {
+    const std::string& name = user.appender->made->fileName();
+    for (const FileUser& other : users) {
+        if (&other == &user) return;
+        if (!isSameFile(user.file, other.file)) continue;
+        const std::string& otherName = other.appender->made->fileName();
         const std::string spelling =
             name == otherName ? "" : ", which calls it " + quoted(otherName);
-        tell(to, Code::FILE_SAME, place,
-             "Appender " + quoted(appender.name) + " writes to the same file as " +
-                 quoted(other.name) + spelling + "; each rotates it by itself");
+        tell(to, Code::FILE_SAME, user.value.place(),
+             "Appender " + quoted(user.appender->name) + " writes to the same file as " +
+                 quoted(other.appender->name) + spelling + "; each rotates it by itself");
     }
 }
 
-void checkBackup(const Configuration& config, const Appender& appender, const Place& place,
-                 Findings& to) {
-    const std::string name = canonicalName(appender.made->fileName());
-    for (const Appender& other : config.appenders) {
-        if (other.made->fileName().empty() || other.made->maxFileSize() <= 0) continue;
-        const std::uint64_t number = backupNumber(name, canonicalName(other.made->fileName()));
-        if (number == 0 || number > other.made->maxBackupIndex()) continue;
-        tell(to, Code::FILE_BACKUP, place,
-             "this is backup " + std::to_string(number) + " of " + quoted(other.name) +
+void checkBackup(const std::vector<FileUser>& users, const FileUser& user, Findings& to) {
+    for (const FileUser& other : users) {
+        const LogAppender& made = *other.appender->made;
+        if (made.maxFileSize() <= 0) continue;
+        const std::uint64_t number = backupNumber(user.file.canonical, other.file.canonical);
+        if (number == 0 || number > made.maxBackupIndex()) continue;
+        tell(to, Code::FILE_BACKUP, user.value.place(),
+             "this is backup " + std::to_string(number) + " of " + quoted(other.appender->name) +
                  ", whose rotation renames and overwrites it");
     }
 }
@@ -128,12 +133,16 @@ void checkSpelling(const Appender& appender, const Piece& value, Findings& to) {
 }  // namespace
 
 void findInFiles(const Reading& reading, Findings& to) {
+    std::vector<FileUser> users;
     for (const Appender& appender : reading.config.appenders) {
         const ConfigStatement* const said = lastOf(appender, "fileName");
         if (said == nullptr || said->value.empty()) continue;
-        const Piece value = valueOf(reading.source, *said);
-        checkSpelling(appender, value, to);
-        checkShared(reading.config, appender, value.place(), to);
-        checkBackup(reading.config, appender, value.place(), to);
+        users.push_back(
+            {&appender, valueOf(reading.source, *said), identityOf(appender.made->fileName())});
+    }
+    for (const FileUser& user : users) {
+        checkSpelling(*user.appender, user.value, to);
+        checkShared(users, user, to);
+        checkBackup(users, user, to);
     }
 }

@@ -76,8 +76,5 @@ Place placeOf(const Source& source, unsigned lineno) {
 }
 
 std::string parseError(const Reading& reading, unsigned lineno) {
-    for (const DeferedLogConf& error : reading.config.parseErrors) {
-        if (error.lineno == lineno) return "Parse error at " + quoted(error.context) + ": ";
-    }
-    return "";
+    return "Parse error at " + quoted(reading.config.parseErrors.at(lineno)) + ": ";
 }

@@ -89,8 +89,7 @@ void explain(const Reading& reading, const SourceLine& line, Findings& to) {
 
 void findInKeys(const Reading& reading, Findings& to) {
     const std::set<unsigned> understood = understoodLines(reading.config);
-    for (const DeferedLogConf& error : reading.config.parseErrors) {
-        if (understood.count(error.lineno) > 0) continue;
-        explain(reading, reading.source.line(error.lineno), to);
+    for (const auto& [lineno, text] : reading.config.parseErrors) {
+        if (understood.count(lineno) == 0) explain(reading, reading.source.line(lineno), to);
     }
 }

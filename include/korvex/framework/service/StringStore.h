@@ -30,11 +30,11 @@ class StringStore {
         std::string value;
     };
 
-    // Reads the file hashDb/data below LoaderInfo's database directory, or the one that is named,
-    // which save() will write. A file that is not there is an empty store; its directory must be
-    // there when it is saved. Damage is logged, as RecordFileManager::readFile() says. Throws
-    // ComponentException when memory for the file runs out, and when it is cut and has no version.
-    // To be called before other threads use the store.
+    // Adds the records of the file hashDb/data below LoaderInfo's database directory, or of the one
+    // that is named, to those in memory; save() will write it. A file that is not there has none;
+    // its directory must be there when it is saved. Damage is logged, as
+    // RecordFileManager::readFile() says. Throws ComponentException when memory for the file runs
+    // out, and when it is cut and has no version. To be called before other threads use the store.
     static StringStore open();
     static StringStore open(const Pathname& file);
 
