@@ -19,16 +19,11 @@ explore() {
 }
 
 build || { cat "$work/build.log"; exit 1; }
+explore 30 "" || { echo "something is found in the unbroken sources"; cat "$work/found.log"; exit 1; }
 failed=0
 for patch in "$@"; do
     name=$(basename "$patch" .patch)
     scenarios=$(sed -n 's/^Found by: //p' "$patch")
-    explore 50 "$scenarios" || {
-        echo "$name: it takes no defect to make one of these fail: $scenarios"
-        cat "$work/found.log"
-        failed=1
-        continue
-    }
     patch -s -d "$tree" -p1 < "$patch" || { echo "$name: does not apply any more"; exit 1; }
     if ! build; then
         cat "$work/build.log"

@@ -149,6 +149,16 @@ void Races::access(const void* address, std::size_t size, bool writes, const voi
     }
 }
 
+void Races::atomicAccess(const void* address, std::size_t size, const void* caller) {
+    if (!active()) return;
+    const auto at = reinterpret_cast<std::uintptr_t>(address);
+    const Cell* const cell = cellOf(at / 8, false);
+    const unsigned bytes = ((1U << size) - 1) << (at % 8);
+    if (cell == nullptr) return;
+    expectBefore(cell->write, static_cast<std::uint8_t>(bytes), "uses (atomically)", "has written",
+                 caller);
+}
+
 void Races::freed(const void* address, std::size_t size, const void* caller) {
     if (!active()) return;
     const std::uintptr_t first = reinterpret_cast<std::uintptr_t>(address) / 8;

@@ -25,6 +25,8 @@ class Races {
     static void forget(const void* object);
 
     static void access(const void* address, std::size_t size, bool writes, const void* caller);
+    // An atomic access: a race with a plain write only.
+    static void atomicAccess(const void* address, std::size_t size, const void* caller);
     // The memory is given up: a write to what of it has been used.
     static void freed(const void* address, std::size_t size, const void* caller);
 };

@@ -69,6 +69,10 @@ bool Scheduler::alone() const {
            }) == 1;
 }
 
+bool Scheduler::hasStarted() const {
+    return _threads[1].life != ThreadState::UNUSED;
+}
+
 Turn Scheduler::point(const Operation& operation) {
     if (!running()) return Turn::READY;
     ThreadState& self = *selfState;
@@ -85,7 +89,8 @@ void Scheduler::note(const ThreadState& self) {
     const Operation& next = self.next;
     write({next.what, next.object, next.caller, static_cast<std::uint8_t>(self.number),
            _forkedChild});
-    if (next.object == nullptr || (alone() && !_forkedChild)) return;
+    // What is used when the others have ended counts: in another schedule they have not.
+    if (next.object == nullptr || !hasStarted()) return;
     if (objects.use(next.object, self.number, next.access == Operation::CHANGES))
         tellShared(next.object);
 }
@@ -95,7 +100,7 @@ void Scheduler::write(const Step& step) {
 }
 
 void Scheduler::freed(const void* memory, std::size_t size) {
-    if (alone() && !_forkedChild) return;
+    if (!hasStarted()) return;
     const char* const p = static_cast<const char*>(memory);
     for (std::size_t at = 0; at < std::min(size, kMostLookedAt); at += 4) {
         if (objects.giveUp(p + at, selfState->number)) tellShared(p + at);

@@ -100,6 +100,8 @@ class Scheduler {
     // How often the turn has passed from one thread to another.
     unsigned turns() const { return _turns; }
     unsigned nextWait() { return ++_waits; }
+    // Whether there has been another thread.
+    bool hasStarted() const;
     // Whether no other thread is left.
     bool alone() const;
     bool inForkedChild() const { return _forkedChild; }

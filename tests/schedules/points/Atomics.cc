@@ -59,6 +59,7 @@ template <class T>
 T load(const volatile T* object, int order, const void* caller) {
     const void* const address = const_cast<const T*>(object);
     beforeLoad(address, caller);
+    Races::atomicAccess(address, sizeof(T), caller);
     if (acquires(order)) Races::acquire(address);
     return *object;
 }
@@ -67,6 +68,7 @@ template <class T>
 void store(volatile T* object, T value, int order, const void* caller) {
     const void* const address = const_cast<const T*>(object);
     announce("store", address, caller);
+    Races::atomicAccess(address, sizeof(T), caller);
     *object = value;
     forgetLook();
     if (releases(order)) {
@@ -80,6 +82,7 @@ template <class T, class Change>
 T change(volatile T* object, Change newValue, int order, const void* caller) {
     const void* const address = const_cast<const T*>(object);
     announce("change", address, caller);
+    Races::atomicAccess(address, sizeof(T), caller);
     const T old = *object;
     *object = newValue(old);
     forgetLook();

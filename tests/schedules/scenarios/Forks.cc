@@ -2,6 +2,7 @@
 
 #include <pthread.h>
 
+#include <cerrno>
 #include <string>
 
 #include "points/Process.h"
@@ -41,6 +42,26 @@ void printf() {
 
 std::string checkPrintf(const Remains& remains) {
     return compare("the log", Remains::lines(remains.file("log")), {"parent", "child"});
+}
+
+// Errors' texts in the words of the user's language.
+void errorTexts() {
+    configure(
+        "rootCategory=INFO,A\nappender.A=File\n"
+        "appender.A.fileName=log\n");
+    Logger logger("test");
+    const auto log = [&] {
+        errno = ENOENT;
+        __extension__ logger.info("%m");
+    };
+    Parallel threads{log};
+    inForkedChild(log);
+    threads.join();
+}
+
+std::string checkErrorTexts(const Remains& remains) {
+    const std::string line = "No such file or directory";
+    return compare("the log", Remains::lines(remains.file("log")), {line, line});
 }
 
 // The first failing line of each.
@@ -215,6 +236,7 @@ const Register registered{
     {"fork-printf", &printf, &checkPrintf},
     {"fork-beside-initialize", &besideInitialize, &checkStderr},
     {"fork-rotating", &rotating, &checkRotating},
+    {"fork-error-texts", &errorTexts, &checkErrorTexts},
     {"fork-failing", &failing, &checkFailing},
     {"fork-failing-early", &failingEarly, &checkFailingEarly},
     {"fork-first-lines", &firstLines, &checkFirstLines},
