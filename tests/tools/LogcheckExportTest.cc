@@ -150,14 +150,14 @@ TEST_F(LogcheckExportTest, TheLayoutsOfTheDocumentationAreJudged) {
 
 TEST_F(LogcheckExportTest, TheDatesOfTheDocumentationAreJudged) {
     std::ifstream table(KORVEX_SOURCE_DIR "/docs/samples/dates.out");
-    std::vector<std::string> good;
+    std::vector<std::string> accepted;
     for (std::string line; std::getline(table, line);) {
         if (line.rfind("| `", 0) != 0) continue;
         const std::string date = line.substr(3, line.find("` |") - 3);
-        if (doubt(date + " %-5p [%t] %c: %m%n").empty()) good.push_back(date);
+        if (doubt(date + " %-5p [%t] %c: %m%n").empty()) accepted.push_back(date);
     }
-    EXPECT_THAT(good, testing::ElementsAre("%d", "%d{}", "%d{ISO8601}", "%d{DATE}",
-                                           "%d{%Y-%m-%dT%H:%M:%S%z}", "%d{%s.%l}", "%-26dx"));
+    EXPECT_THAT(accepted, testing::ElementsAre("%d", "%d{}", "%d{ISO8601}", "%d{DATE}",
+                                               "%d{%Y-%m-%dT%H:%M:%S%z}", "%d{%s.%l}", "%-26dx"));
 }
 
 TEST_F(LogcheckExportTest, WhatAnEngineCannotBeToldIsAnErrorOfThatEngine) {
