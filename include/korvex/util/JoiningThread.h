@@ -3,7 +3,6 @@
 #include <korvex/Export.h>
 #include <korvex/util/Thread.h>
 
-#include <functional>
 #include <utility>
 
 KORVEX_NAMESPACE(korvex) {
@@ -16,13 +15,13 @@ KORVEX_NAMESPACE(korvex) {
 //
 // As with Thread, an exception that leaves the callable ends the process, and the calls below
 // belong to one thread. After fork(2) the child must not destroy the parent's objects.
+template <class Body>
 class JoiningThread {
   public:
-    // The name is not copied and must outlive the thread. `body` is kept until this object goes.
-    // Throws what Thread's constructor throws, and std::bad_alloc.
-    JoiningThread(const char* name, std::function<void()> body) : _worker(name, std::move(body)) {
-        _worker.go();
-    }
+    // The name is not copied and must outlive the thread. `body`, which is called without
+    // arguments, is kept until this object goes. Throws what Thread's constructor throws, and what
+    // moving `body` throws.
+    JoiningThread(const char* name, Body body) : _worker(name, std::move(body)) { _worker.go(); }
     JoiningThread(const JoiningThread&) = delete;
     JoiningThread& operator=(const JoiningThread&) = delete;
     // Waits for the end of the thread, if join() has not. Throws what Thread::join throws.
@@ -42,12 +41,11 @@ class JoiningThread {
   private:
     class Worker : public Thread {
       public:
-        Worker(const char* name, std::function<void()> body)
-            : Thread(name), _body(std::move(body)) {}
+        Worker(const char* name, Body body) : Thread(name), _body(std::move(body)) {}
         void main() override { _body(); }
 
       private:
-        const std::function<void()> _body;
+        Body _body;
     };
 
     Worker _worker;

@@ -8,6 +8,8 @@
 
 KORVEX_NAMESPACE(korvex) {
 
+class KORVEX_HIDDEN ActiveThreads;
+
 // A piece of work that is handed to another thread to run, through an InThreadActorQueue.
 class InThreadActor {
   public:
