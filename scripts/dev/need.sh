@@ -10,6 +10,7 @@ there() {
         libxml2-dev) pkg-config --exists libxml-2.0 ;;
         libgtest-dev) pkg-config --exists gtest ;;
         libgmock-dev) pkg-config --exists gmock ;;
+        liblog4cplus-dev) pkg-config --exists log4cplus ;;
         *) PATH=$PATH:/usr/sbin:/sbin command -v "$1" ;;
     esac > /dev/null 2>&1
 }
