@@ -6,6 +6,7 @@ there() {
     dpkg-query -W -f '${Status}\n' "$1" 2> /dev/null | grep -q 'ok installed' && return
     case $1 in
         abigail-tools) command -v abidw ;;
+        locales) command -v locale ;;
         ninja-build) command -v ninja ;;
         libpopt-dev) pkg-config --exists popt ;;
         libxml2-dev) pkg-config --exists libxml-2.0 ;;

@@ -4,6 +4,7 @@
 
 #include <atomic>
 #include <map>
+#include <set>
 #include <string>
 
 #include "framework/service/StoreSteps.h"
@@ -56,6 +57,7 @@ class StoreCrash : public testsupport::RecordsToolTest {
         EXPECT_TRUE(known) << left.size();
         EXPECT_EQ(run({"check"}).status, whole ? 0 : 3) << left.size();
         ++_seen[whole ? "whole" : "cut"];
+        _sizes.insert(left.size());
     }
     // A file that was cut between two records cannot be told from a whole one.
     static bool endsAtARecord(const std::string& left, unsigned n) {
@@ -67,13 +69,13 @@ class StoreCrash : public testsupport::RecordsToolTest {
     }
 
     std::map<std::string, unsigned> _seen;
+    std::set<std::size_t> _sizes;  // of the files that were left
 };
 
 TEST_F(StoreCrash, AKillAtEachCallOfASaveLeavesABeginningOfIt) {
     unsigned kills = 0;
     for (const Call call : {Call::fopen, Call::fwrite, Call::fclose}) {
-        const unsigned long step = call == Call::fwrite ? 7 : 1;
-        for (unsigned long k = 1; k < 300; k += step) {
+        for (unsigned long k = 1; k < 300; ++k) {
             Pathname(data).unlink();
             if (!killAtCall(call, k, [this] { saveAgainAndAgain(); })) break;
             ++kills;
@@ -81,8 +83,8 @@ TEST_F(StoreCrash, AKillAtEachCallOfASaveLeavesABeginningOfIt) {
         }
     }
     EXPECT_GE(kills, 50U);
-    EXPECT_GT(_seen["cut"], 0U);
     EXPECT_GT(_seen["whole"], 0U);
+    EXPECT_GT(_sizes.size(), 10U);
     std::printf("[  killed  ] saving: %u times\n", kills);
 }
 

@@ -138,6 +138,24 @@ TEST(EarlyLoggersTest, ExceptionsAndTextsAreNotInterpreted) {
               "%d\n%s %m\n100%\n");
 }
 
+TEST(EarlyLoggersTest, AnExceptionsTextMaySpoilErrno) {
+    struct Spoiling : std::exception {
+        const char* what() const noexcept override {
+            errno = EIO;
+            return "spoilt";
+        }
+    };
+    EXPECT_EQ(errOf([] {
+                  Logger logger("a");
+                  errno = ENOENT;
+                  logger.warn(Spoiling());
+                  EXPECT_EQ(errno, ENOENT);
+                  logger.debug(Spoiling());
+                  EXPECT_EQ(errno, ENOENT);
+              }),
+              "spoilt\n");
+}
+
 TEST(EarlyLoggersTest, PercentMIsTheErrnoOfTheCall) {
     EXPECT_EQ(errOf([] {
                   Logger logger("a");

@@ -7,9 +7,8 @@
 
 #include <cstdint>
 #include <cstdio>
-#include <map>
+#include <memory>
 #include <string>
-#include <utility>
 #include <vector>
 
 KORVEX_NAMESPACE(korvex) {
@@ -40,12 +39,15 @@ struct PersistentFullData {
 //
 // A child of fork(2) may use the store, of which it has its own copy, whatever put() calls were
 // under way in the parent's other threads; its file is the parent's still, so it should name its
-// own.
+// own. Other calls that were under way in other threads may have left the copy half changed: such
+// a child must not use the store. Whatever was under way, it may exit(3): the parent's save is
+// not disturbed.
 //
-// What it does not promise: a save rewrites the file in place, without fsync(2), so a crash or a
-// full disk in its middle leaves the file cut after its last complete write (memory is never
-// touched by a failed save). A value that put() replaces is never freed. A key is NUL-terminated
-// when it is loaded: one with an embedded NUL comes back shortened. Keys that begin with
+// What it does not promise: a save rewrites the file in place, without fsync(2), so a crash, an
+// exit(3) in another thread or a full disk in its middle leaves the file cut: a beginning of what
+// was to be saved, and nothing else (memory is never touched by a failed save). A value that put()
+// replaces is never freed. A key is NUL-terminated when it is loaded: one with an embedded NUL
+// comes back shortened. Keys that begin with
 // "_record-file-version" in any case are taken for the file's version and do not come back at all.
 class RecordFileManager {
   public:
@@ -65,7 +67,8 @@ class RecordFileManager {
     // Stores a copy of the value under the key, replacing the one it had, and saves everything if
     // writeToFile is true. The key "_record-file-version" is refused with a logged error. Throws
     // ComponentException "Unable to allocate memory for storing hash value.", the store being as
-    // it was, and what saveToFile() throws, the value being stored.
+    // it was (a key of 4 GiB is refused so too), and what saveToFile() throws, the value being
+    // stored.
     void put(const std::string& key, const PersistentHashData& data, bool writeToFile)
         KORVEX_EXCLUDES(_mutex);
     // Hands out a copy of the value, which the caller frees with delete[] static_cast<char*>(p);
@@ -74,6 +77,9 @@ class RecordFileManager {
     // Removes the record and saves everything; false, and nothing saved, when the key is absent.
     // Throws what saveToFile() throws, the record being gone.
     bool remove(const std::string& key);
+    // The same, but saves only if writeToFile is true: for removing several with one save, the last
+    // one's.
+    bool remove(const std::string& key, bool writeToFile);
     // Appends copies of the records whose keys begin with partialKey, in byte-wise key order; ""
     // matches all. Whether there was any. See PersistentFullData for who frees.
     bool enumerate(const std::string& partialKey,
@@ -89,9 +95,9 @@ class RecordFileManager {
     // and leaves this store's file and version alone.
     void preload(const std::string& prefix, const Pathname& file);
     // Rewrites the record file: the version record, then all records in key order. Failures to
-    // open, write or close it are logged. The process's umask is 066 afterwards, and stays so:
-    // later files, log files among them, become 0600. Throws ComponentException when no file is
-    // named, and std::bad_alloc when memory runs out, the file then being cut as by a failed write.
+    // open, write or close it are logged; after a failed write the file is a beginning of what was
+    // to be saved. The process's umask is 066 afterwards, and stays so: later files, log files
+    // among them, become 0600. Throws ComponentException when no file is named.
     void saveToFile();
 
     // Steps of the above, for tests and tools.
@@ -103,21 +109,16 @@ class RecordFileManager {
     bool writeRecord(std::FILE* outFile, std::string key, unsigned int dataLen, const void* data);
 
   private:
-    class Loader;
+    struct State;
 
-    RecordFileManager() = default;
-
-    static void keepLockThroughForks();
+    RecordFileManager();
 
     void load(const Pathname& file, const std::string& prefix, std::string& version);
-    void insert(std::string key, std::uint32_t size, void* block);
 
     static RecordFileManager* __pInstance;
 
-    Pathname dbHomePath;                                             // empty until set
-    std::string fileVersion;                                         // as read from the file
-    Mutex _mutex;                                                    // serialises put()
-    std::map<std::string, std::pair<std::uint32_t, void*>> records;  // blocks by malloc
+    Mutex _mutex;  // serialises put()
+    const std::unique_ptr<State> _state;
 };
 
 }  // KORVEX_NAMESPACE(korvex)
