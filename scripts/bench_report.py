@@ -20,7 +20,9 @@ read and one write of the whole file; for the start, splitting the same lines in
 files. **Peers** are those of Debian that were installed. Every logging peer is set up to have each line
 in the kernel when the call returns, as Korvex has; glog has a form of line of its own. Stores that work
 in their files load into a `std::map` and save from one, in one transaction; saving waits for no disk
-(SQLite once with `synchronous=OFF`, once with a write-ahead log).
+(SQLite once with `synchronous=OFF`, once with a write-ahead log). For the record tool the floor copies
+or reads as many bytes, and the peers are the tools of other stores on the same records: `db_load` and
+`db_dump`, `mdb_load` and `mdb_dump`, `gdbmtool`, `sqlite3`.
 """
 
 REMARKS = """
@@ -74,7 +76,8 @@ def line(row, metric, result):
 
 def others_line(row, metric, result, names):
     """One line of the table of everybody, in floors."""
-    title = row + (" p99" if metric == "p99" else "")
+    named_by_it = metric == "ns" or row.startswith("memory")
+    title = row + ("" if named_by_it else f" {metric}")
     cells = [f"{result[name]['to_floor']:.2f}" if name in result else "" for name in names]
     return f"| {title} | " + " | ".join(cells) + " |"
 
@@ -82,6 +85,8 @@ def others_line(row, metric, result, names):
 def everybody(results, table):
     """The ratios of all contestants of a table."""
     rows = {row: r for row, r in results["rows"].items() if ROWS[row].table == table}
+    if not rows:
+        return []
     names = list(dict.fromkeys(n for r in rows.values() for by in r.values() for n in by))[1:]
     lines = ["", f"| in floors | {' | '.join(names)} |", "|---" * (len(names) + 1) + "|"]
     for row, metrics in rows.items():
@@ -100,7 +105,8 @@ def page(results):
             "![Throughput and 99th percentile by threads](threads.svg)",
             "![Store cost by number of records](store.svg)",
             "", "## Everybody"]
-    out += everybody(results, "logging") + everybody(results, "store")
+    for table in ("logging", "store", "tools"):
+        out += everybody(results, table)
     out += instruction_table(results) + slope_table(results) + function_table(results)
     return "\n".join(out) + "\n"
 

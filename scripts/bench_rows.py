@@ -39,6 +39,10 @@ for n in SIZES:
 for n, puts in ((100, 1000), (10_000, 30)):
     ROWS[f"put-{n}"] = Row("store", puts, f"put and save one record among {n:,}, in /dev/shm", 1.05)
 ROWS["memory-1000000"] = Row("store", 1, "peak memory, 1,000,000 records loaded", 0.75)
+for n in (100_000, 1_000_000):
+    for verb, title in (("load", "load a dump of"), ("dump", "dump"), ("get", "get one of"),
+                        ("list", "list the keys of")):
+        ROWS[f"tool-{verb}-{n}"] = Row("tools", 1, f"`korvex-records`: {title} {n:,} records")
 
 # Counted under callgrind: the number of calls, what to run, and what one call is.
 COUNTED = {

@@ -41,5 +41,15 @@ END
     $(pkg-config --libs popt libxml-2.0)
 "$work/hello" 2>&1 | grep -qx hello
 strip "$work/hello"
+
+# bytes CALL: the code of a function that makes that call.
+bytes() {
+    printf '#include <korvex/util/Logger.h>\nvoid f(Logger& logger, int n) { %s; }\n' "$1" > "$work/call.cc"
+    # shellcheck disable=SC2086  # flags
+    "$cxx" $flags -O2 -c "$work/call.cc" -o "$work/call.o"
+    nm -S --size-sort "$work/call.o" | awk '/_Z1f/ { print $2 }' | tail -n 1
+}
+printf 'a call site, with its function: %d bytes as a method, %d as a macro\n' \
+    "0x$(bytes 'logger.debug("%%d", n)')" "0x$(bytes 'KORVEX_DEBUG(logger, "%%d", n)')"
 echo "static hello, stripped: $(stat -c %s "$work/hello") bytes; of text: $(size "$work/hello" | awk 'NR == 2 { print $1 }')"
 echo "libkorvex.a: $(stat -c %s "$build/src/libkorvex.a") bytes"

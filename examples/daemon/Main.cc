@@ -13,13 +13,15 @@
 
 #include "Counters.h"
 #include "Daemon.h"
+#include "Levels.h"
 #include "PidFile.h"
 #include "Receiver.h"
 #include "Saver.h"
 #include "Stop.h"
 
 // tallyd counts the names that come to its UDP port, one a datagram, and keeps the counts. It ends
-// on SIGTERM and SIGINT; SIGHUP saves at once. See README.md.
+// on SIGTERM and SIGINT; SIGHUP saves at once; SIGUSR1 sets levels of
+// logging. See README.md.
 namespace {
 
 enum Status { ENDED = 0, FAILED = 1, USAGE = 2 };
@@ -40,7 +42,7 @@ std::string complaintAbout(const LoaderInfo& info) {
 sigset_t blockSignals() {
     sigset_t signals;
     sigemptyset(&signals);
-    for (const int signal : {SIGTERM, SIGINT, SIGHUP})
+    for (const int signal : {SIGTERM, SIGINT, SIGHUP, SIGUSR1})
         sigaddset(&signals, signal);
     pthread_sigmask(SIG_BLOCK, &signals, nullptr);
     return signals;
@@ -69,9 +71,12 @@ void run(const LoaderInfo& info, Daemon& daemon) {
     logger.info("%s started", info.getComponentName().c_str());
     daemon.ready();
 
+    const Levels levels(info.getKorvexDb() / "tallyd.levels");
     int signal;
-    while ((signal = nextOf(signals)) == SIGHUP)
-        counters.save();
+    while ((signal = nextOf(signals)) == SIGHUP || signal == SIGUSR1) {
+        if (signal == SIGHUP) counters.save();
+        if (signal == SIGUSR1) levels.apply();
+    }
     logger.info("ending by signal %d", signal);
     stop.now();
     receiver.join();

@@ -22,7 +22,7 @@ void giveBack() {
     pthread_mutex_unlock(&mutex);
 }
 
-KORVEX_FIRST_AT_START_UP void keepThroughForks() {
+KORVEX_REGISTERS_LIBC_LOCK void keepThroughForks() {
     pthread_atfork(&take, &giveBack, &giveBack);
 }
 

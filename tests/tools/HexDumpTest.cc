@@ -1,4 +1,4 @@
-#include "korvex-records/HexDump.h"
+#include "korvex-records/terminal/HexDump.h"
 
 #include <gtest/gtest.h>
 

@@ -1,4 +1,4 @@
-#include "korvex-records/Histogram.h"
+#include "korvex-records/terminal/Histogram.h"
 
 #include <gtest/gtest.h>
 

@@ -33,7 +33,7 @@ using KorvexLogcheckTest = LogcheckToolTest;
 const std::string kTwoAppenders =
     "log4cpp.rootCategory=INFO, MAIN   # for every other channel\n"
     "log4cpp.category.net=DEBUG\n"
-    "log4cpp.category.audit=NOTICE, AUDIT, MAIN\n"
+    "log4cpp.category.audit=WARN, AUDIT, MAIN\n"
     "log4cpp.appender.MAIN.fileName=${KORVEX_HOME}/log/main.log\n"
     "log4cpp.appender.MAIN.maxFileSize=1000\n"
     "log4cpp.appender.MAIN.maxBackupIndex=5\n"
@@ -53,7 +53,7 @@ TEST_F(KorvexLogcheckTest, ACleanConfigurationIsShownWhole) {
               "  to      MAIN\n"
               "\n"
               "category audit\n"
-              "  level   NOTICE and above\n"
+              "  level   WARN and above\n"
               "  to      AUDIT, MAIN\n"
               "\n"
               "appender MAIN\n"
@@ -92,14 +92,20 @@ TEST_F(KorvexLogcheckTest, AnEmptyFileMeansTheRootOnStandardError) {
               "no errors, no warnings\n");
 }
 
-TEST_F(KorvexLogcheckTest, ASampleIsDatedAndShowsEachOfItsLines) {
-    const std::string out = check(
-                                "rootCategory=ERROR,A\nappender.A.fileName=/a\n"
-                                "appender.A.layout.ConversionPattern=%d{ISO8601} [%t]%n%p: %m%n\n")
-                                .out;
-    EXPECT_THAT(out,
-                testing::ContainsRegex("  sample  [0-9]{4}-[0-9]{2}-[0-9]{2} [0-9:]{8},[0-9]{3} "
-                                       "\\[Main Thread\\]\n          ERROR: this is a message\n"));
+// By the clock on the wall, whatever the zone, so that a sample in a review or a test stays.
+TEST_F(KorvexLogcheckTest, ASampleHasAFixedTimeAndShowsEachOfItsLines) {
+    configure(
+        "rootCategory=ERROR,A\nappender.A.fileName=/a\n"
+        "appender.A.layout.ConversionPattern=%d [%t] %R %-6r|%08u|%.2r%%%n%p: %m%n\n");
+    for (const char* const zone : {"UTC", "Asia/Tokyo", "EST5EDT"}) {
+        const ChildResult result = runInChild([&] {
+            setenv("TZ", zone, 1);
+            execLogcheck({file});
+            return 127;
+        });
+        EXPECT_THAT(result.out, HasSubstr("  sample  2007-03-05 14:03:09,007 [Main Thread] 2 2500  "
+                                          "|00010000|25%\n          ERROR: this is a message\n"));
+    }
 }
 
 TEST_F(KorvexLogcheckTest, TheHomeComesFromTheOptionElseFromTheEnvironment) {
@@ -130,10 +136,11 @@ TEST_F(KorvexLogcheckTest, OneBackupAndNoneAreSaidInTheirOwnWords) {
 TEST_F(KorvexLogcheckTest, AChannelOfACategoryGetsWhatItsLevelLetsPass) {
     const ChildResult result = check(kTwoAppenders, {"--channel", "audit", "--home", "/opt/x"});
     const std::string both = "AUDIT (/var/audit.log), MAIN (/opt/x/log/main.log)\n";
-    EXPECT_EQ(result.out, "channel audit\n  DEBUG   dropped\n  INFO    dropped\n  NOTICE  " + both +
-                              "  WARN    " + both + "  ERROR   " + both + "  CRIT    " + both +
-                              "  ALERT   " + both + "  FATAL   " + both + "  EMERG   " + both +
-                              "\nno errors, no warnings\n");
+    EXPECT_EQ(result.out,
+              "channel audit\n  DEBUG   dropped\n  INFO    dropped\n"
+              "  NOTICE  dropped\n  WARN    " +
+                  both + "  ERROR   " + both + "  CRIT    " + both + "  ALERT   " + both +
+                  "  FATAL   " + both + "  EMERG   " + both + "\nno errors, no warnings\n");
     EXPECT_EQ(result.status, 0);
 }
 
@@ -190,8 +197,16 @@ TEST_F(KorvexLogcheckTest, WhatCannotBeReadIsStatusTwo) {
 }
 
 TEST_F(KorvexLogcheckTest, WrongUsageIsStatusTwo) {
-    for (const std::vector<std::string>& arguments : std::vector<std::vector<std::string>>{
-             {}, {"a", "b"}, {"--nonsense", "a"}, {"a", "--home"}, {"a", "--channel"}}) {
+    for (const std::vector<std::string>& arguments :
+         std::vector<std::vector<std::string>>{{},
+                                               {"--nonsense", "a"},
+                                               {"a", "--home"},
+                                               {"a", "--channel"},
+                                               {"a", "--user", "root"},
+                                               {"a", "--fix", "--json"},
+                                               {"a", "-q", "--json"},
+                                               {"a", "--channel", "x", "--json"},
+                                               {"a", "--codes"}}) {
         const ChildResult result = run(arguments);
         EXPECT_EQ(result.status, 2);
         EXPECT_THAT(result.err, StartsWith("korvex-logcheck: "));
@@ -199,11 +214,108 @@ TEST_F(KorvexLogcheckTest, WrongUsageIsStatusTwo) {
     }
 }
 
+TEST_F(KorvexLogcheckTest, QuietShowsTheFindingsOnlyAndNothingWithoutAny) {
+    EXPECT_EQ(check(kTwoAppenders, {"-q"}).out, "");
+    const ChildResult result = check(kTwoAppenders + "category.x=debug\n", {"--quiet"});
+    EXPECT_EQ(result.out, file +
+                              ":10:12: error: Parse error at \"x=debug\": \"debug\" is neither "
+                              "a level nor an appender; levels are in upper case; did you mean "
+                              "\"DEBUG\"? [level.case]\n");
+    EXPECT_EQ(result.status, 2);
+}
+
+TEST_F(KorvexLogcheckTest, JsonIsAFindingALine) {
+    const ChildResult result =
+        check("rootCategory=debug, \"\\\x1b\ncategory.x=NOTICE\ncategory.y=EMERG\n", {"--json"});
+    EXPECT_EQ(
+        result.out,
+        "{\"file\":\"" + file +
+            "\",\"line\":1,\"column\":14,\"severity\":\"error\",\"code\":\"level.case\","
+            "\"message\":\"Parse error at \\\"debug, \\\"\\\\\\\\x1b\\\": \\\"debug\\\" is neither "
+            "a "
+            "level nor an appender; levels are in upper case\",\"meant\":\"DEBUG\"}\n"
+            "{\"file\":\"" +
+            file +
+            "\",\"line\":1,\"column\":21,\"severity\":\"error\",\"code\":\"word.unknown\","
+            "\"message\":\"Parse error at \\\"debug, \\\"\\\\\\\\x1b\\\": \\\"\\\"\\\\\\\\x1b\\\" "
+            "is neither "
+            "a level nor an appender; the root names no appender that exists, so it writes to "
+            "rootAppender\",\"meant\":null}\n"
+            "{\"file\":\"" +
+            file +
+            "\",\"line\":1,\"column\":23,\"severity\":\"warning\",\"code\":\"bytes.control\","
+            "\"message\":\"a control character, \\\\x1b: it is used as it "
+            "stands\",\"meant\":null}\n"
+            "{\"file\":\"" +
+            file +
+            "\",\"line\":2,\"column\":12,\"severity\":\"note\",\"code\":\"level.unused\","
+            "\"message\":\"nothing is logged at NOTICE: it lets pass what WARN does\",\"meant\":"
+            "\"WARN\"}\n"
+            "{\"file\":\"" +
+            file +
+            "\",\"line\":3,\"column\":12,\"severity\":\"warning\",\"code\":\"level.silent\","
+            "\"message\":\"nothing is logged at EMERG: category \\\"y\\\" is silent, FATAL "
+            "messages "
+            "included\",\"meant\":null}\n");
+    EXPECT_EQ(result.status, 2);
+    EXPECT_EQ(check(kTwoAppenders, {"--json"}).out, "");
+}
+
+TEST_F(KorvexLogcheckTest, AMinusSignIsStandardInput) {
+    writeFile(file, "rootCategory=debug\n");
+    const auto fromInput = [&](const std::vector<std::string>& arguments) {
+        return runInChild([&] {
+            dup2(open(file.c_str(), O_RDONLY), STDIN_FILENO);
+            execLogcheck(arguments);
+            return 127;
+        });
+    };
+    const ChildResult told = fromInput({"-q", "-"});
+    EXPECT_THAT(told.out, StartsWith("-:1:14: error: Parse error at \"debug\""));
+    EXPECT_EQ(told.status, 2);
+    EXPECT_EQ(fromInput({"--fix", "-"}).out, "rootCategory=DEBUG\n");
+}
+
+TEST_F(KorvexLogcheckTest, SeveralFilesDoNotMixAndTheWorstOneIsTheStatus) {
+    const std::string other = dir.file("other.cfg");
+    configure(
+        "rootCategory=DEBUG, A\nappender.A.fileName=/a\nappender.A.layout=SimpleLayout\n"
+        "category.x=A\nappender.rootAppender.layout=BasicLayout\n");
+    writeFile(other, "category.y=A\n");
+    const ChildResult result = run({file, other, dir.file("none")});
+    const std::size_t second = result.out.find("configuration " + other + "\n\nroot\n");
+    EXPECT_THAT(result.out, StartsWith("configuration " + file + "\n\nroot\n"));
+    ASSERT_NE(second, result.out.npos);
+    EXPECT_EQ(result.out.substr(second),
+              "configuration " + other +
+                  "\n\nroot\n  level   INFO and above\n  to      rootAppender (standard error)\n"
+                  "\ncategory y\n  level   INFO and above\n"
+                  "  to      rootAppender (standard error)\n\nappender rootAppender\n"
+                  "  file    standard error\n  limits  none\n  layout  %m%n\n"
+                  "  sample  this is a message\n  used by the root, y\n\n" +
+                  other +
+                  ":1:12: error: Parse error at \"y=A\": \"A\" is neither a level nor an appender; "
+                  "the category names no appender that exists, so it writes to rootAppender "
+                  "[word.unknown]\n1 error, 0 warnings\n");
+    EXPECT_EQ(result.err,
+              "korvex-logcheck: cannot read " + dir.file("none") + ": No such file or directory\n");
+    EXPECT_EQ(result.status, 2);
+    writeFile(other, "category.y=EMERG\n");
+    EXPECT_EQ(run({"-q", file, other}).status, 1);
+    EXPECT_EQ(run({"-q", other, file}).status, 1);
+}
+
+TEST_F(KorvexLogcheckTest, AFileWithoutAnEndIsNoConfiguration) {
+    const ChildResult result = run({"/dev/zero"});
+    EXPECT_EQ(result.err, "korvex-logcheck: cannot read /dev/zero: it is larger than 1 MiB\n");
+    EXPECT_EQ(result.status, 2);
+}
+
 TEST_F(KorvexLogcheckTest, HelpAndVersionAreStatusZero) {
     EXPECT_THAT(run({"--version"}).out, MatchesRegex("korvex-logcheck [0-9.]+\n"));
     const ChildResult help = run({"--help"});
-    EXPECT_THAT(help.out, AllOf(HasSubstr("FILE [--home DIR] [--channel NAME]"),
-                                HasSubstr("--channel=NAME"), HasSubstr("--home=DIR")));
+    EXPECT_THAT(help.out, AllOf(HasSubstr("[OPTION...] FILE..."), HasSubstr("--channel=NAME"),
+                                HasSubstr("--home=DIR")));
     EXPECT_EQ(help.status, 0);
 }
 
@@ -239,7 +351,7 @@ TEST_F(KorvexLogcheckTest, ThereAreColoursOnATerminalOnly) {
     EXPECT_THAT(plain, Not(HasSubstr("\033")));
     const std::string colourful = onTerminal(file, {});
     EXPECT_THAT(colourful, StartsWith("\033[1mroot\033[0m"));
-    EXPECT_THAT(colourful, HasSubstr(":1: \033[1;31merror: \033[0mParse error"));
+    EXPECT_THAT(colourful, HasSubstr(":1:1: \033[1;31merror: \033[0mParse error"));
 }
 
 TEST_F(KorvexLogcheckTest, NoColorAndADumbTerminalAreRespected) {
@@ -261,7 +373,7 @@ TEST_F(KorvexLogcheckTest, NoControlCharacterOfTheFileReachesTheTerminal) {
     EXPECT_THAT(out, AllOf(HasSubstr("category \\x1bx\n"), HasSubstr("appender \\x07A\n"),
                            HasSubstr("file    /\\x08\n"), HasSubstr("layout  \\x1b[m%m\n"),
                            HasSubstr("sample  \\x1b[mthis is a message\n"),
-                           HasSubstr(":5: error: Parse error at \"\\x1b]0;\"")));
+                           HasSubstr(":5:1: error: Parse error at \"\\x1b]0;\"")));
 }
 
 }  // namespace

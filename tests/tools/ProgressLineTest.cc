@@ -1,4 +1,4 @@
-#include "korvex-records/ProgressLine.h"
+#include "korvex-records/terminal/ProgressLine.h"
 
 #include <gtest/gtest.h>
 

@@ -36,7 +36,7 @@ TEST_F(DiffTest, TheSameRecordsAreNoDifferenceWhateverTheirOrder) {
     EXPECT_EQ(result.status, 0);
 }
 
-TEST_F(DiffTest, NothingIsChangedAndNoLockIsLeftBesideTheOtherFile) {
+TEST_F(DiffTest, NothingIsChangedAndNothingIsLeftBesideTheOtherFile) {
     const std::string content = fileOf({{"a", "1"}});
     writeFile(data, content);
     writeFile(other, fileOf({{"b", "1"}}) + "\5");

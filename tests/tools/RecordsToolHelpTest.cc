@@ -7,31 +7,36 @@ namespace {
 using namespace testsupport;
 using testing::ElementsAreArray;
 using testing::HasSubstr;
-using testing::Not;
 
 const std::string kFolder = KORVEX_SOURCE_DIR "/tools/korvex-records/";
 
 class HelpTest : public RecordsToolTest {
   protected:
-    const std::string help = run({"--help"}).out;
-
+    // Without any environment.
+    ChildResult bare(const std::vector<std::string>& arguments) const {
+        return runInChild([&] {
+            clearenv();
+            testsupport::execTool(arguments);
+            return 127;
+        });
+    }
     std::vector<std::string> verbs() const {
-        const std::size_t start = help.find("[OPTION...] ") + 12;
-        std::istringstream list(help.substr(start, help.find(" [ARG", start) - start));
+        std::istringstream lines(help.substr(help.find("\nVerbs:\n") + 8));
         std::vector<std::string> all;
-        for (std::string verb; std::getline(list, verb, '|');)
-            all.push_back(verb);
+        for (std::string line; std::getline(lines, line) && !line.empty();)
+            all.push_back(line.substr(2, line.find(' ', 2) - 2));
         return all;
     }
     std::vector<std::string> options() const {
         std::vector<std::string> all;
-        for (std::size_t at = 0; (at = help.find("--", at)) != help.npos;) {
-            const std::size_t end = help.find_first_of(" =\n", at);
+        for (std::size_t at = help.find("\nOptions"); (at = help.find(" --", at)) != help.npos;) {
+            const std::size_t end = help.find_first_of(" =\n", ++at);
             all.push_back(help.substr(at, end - at));
-            at = end;
         }
         return all;
     }
+
+    const std::string help = bare({"--help"}).out;
 };
 
 std::string manualPage() {
@@ -40,18 +45,80 @@ std::string manualPage() {
     return page;
 }
 
-TEST_F(HelpTest, ItNamesEachVerbAndOption) {
-    EXPECT_THAT(verbs(), ElementsAreArray({"list", "get", "put", "remove", "dump", "load", "check",
-                                           "diff", "stats"}));
+TEST_F(HelpTest, ItNamesEachVerbAndOptionAndSaysWhatTheVerbsDo) {
+    EXPECT_THAT(verbs(), ElementsAreArray({"list", "get", "put", "remove", "dump", "load", "batch",
+                                           "check", "diff", "stats", "salvage", "help"}));
     EXPECT_THAT(options(),
-                ElementsAreArray({"--file", "--long", "--null", "--hex", "--print", "--input",
-                                  "--create", "--force", "--version", "--help"}));
+                ElementsAreArray({"--file", "--long", "--null", "--hex", "--input", "--value",
+                                  "--print", "--json", "--replace", "--keep", "--dry-run",
+                                  "--output", "--key-escaped", "--create", "--wait",
+                                  "--any-version", "--verbose", "--version", "--help"}));
+    EXPECT_THAT(help, HasSubstr("\n  batch [FILE]            do many puts and removes, or none\n"));
 }
 
-TEST_F(HelpTest, TheVerbsItNamesAreKnown) {
-    for (const std::string& verb : verbs())
-        EXPECT_THAT(run({verb, "a", "b", "c"}).err, Not(HasSubstr("unknown verb"))) << verb;
-    EXPECT_THAT(run({"unlist"}).err, HasSubstr("unlist: unknown verb"));
+TEST_F(HelpTest, ItNeedsNoEnvironment) {
+    EXPECT_EQ(bare({"--help"}).status, 0);
+    EXPECT_EQ(bare({"--help"}).err, "");
+    for (const std::vector<std::string>& arguments :
+         std::vector<std::vector<std::string>>{{"-h"}, {"-?"}, {"help"}, {"-h", "nonsense"}}) {
+        EXPECT_EQ(bare(arguments).out, help) << arguments[0];
+        EXPECT_EQ(bare(arguments).status, 0) << arguments[0];
+    }
+    EXPECT_EQ(bare({"--version"}).out, "korvex-records 1.0.0\n");
+    EXPECT_EQ(bare({"nonsense"}).status, 2);
+}
+
+TEST_F(HelpTest, AVerbsHelpHasItsOwnOptions) {
+    const std::string expected =
+        "Usage: korvex-records [OPTION...] get KEY\n"
+        "a key's value\n"
+        "\n"
+        "Options:\n"
+        "  -f, --file=FILE         use this record file\n"
+        "  -x, --hex               the value as hex digits\n"
+        "      --key-escaped       keys are given as list shows them\n"
+        "      --verbose           say which logging configuration is used\n"
+        "      --version           show the version\n"
+        "  -h, --help              show this text, or a verb's\n";
+    EXPECT_EQ(bare({"help", "get"}).out, expected);
+    EXPECT_EQ(bare({"get", "-h"}).out, expected);
+    EXPECT_EQ(bare({"get", "a", "b", "--help"}).out, expected);
+    EXPECT_EQ(bare({"help", "nonsense"}).status, 2);
+}
+
+TEST_F(HelpTest, AnOptionThatAVerbDoesNotTakeIsAnError) {
+    for (const std::string& verb : verbs()) {
+        const std::string own = bare({"help", verb}).out;
+        for (const std::string& option : options()) {
+            const ChildResult result = bare({verb, option + "=1"});
+            const bool isTaken = own.find(option + "=") != own.npos;
+            const bool isFlag = help.find(option + "=") == help.npos;
+            if (isTaken || isFlag) continue;
+            EXPECT_EQ(result.status, 2) << verb << option;
+            EXPECT_EQ(result.err, "korvex-records: " + verb + " takes no " + option + "; see " +
+                                      verb + " --help\n");
+        }
+    }
+    for (const std::vector<std::string>& arguments : std::vector<std::vector<std::string>>{
+             {"get", "-p", "a"}, {"list", "-x"}, {"dump", "--replace"}, {"put", "-l", "a", "1"}}) {
+        EXPECT_EQ(bare(arguments).status, 2) << arguments[0];
+        EXPECT_THAT(bare(arguments).err, HasSubstr(" takes no --")) << arguments[0];
+    }
+}
+
+TEST_F(HelpTest, WhatWasMeantIsTold) {
+    const std::pair<const char*, const char*> meant[] = {
+        {"delete", "remove"}, {"set", "put"},        {"ls", "list"},      {"cat", "get"},
+        {"lsit", "list"},     {"gte", "get"},        {"remov", "remove"}, {"dmup", "dump"},
+        {"chekc", "check"},   {"slavage", "salvage"}};
+    for (const auto& [typed, verb] : meant) {
+        EXPECT_EQ(bare({typed}).err, std::string("korvex-records: ") + typed +
+                                         ": unknown verb; did you mean " + verb + "?\n");
+    }
+    EXPECT_EQ(bare({"xyzzy"}).err, "korvex-records: xyzzy: unknown verb; see --help\n");
+    EXPECT_EQ(bare({"--hepl"}).err,
+              "korvex-records: --hepl: unknown option; did you mean --help?\n");
+    EXPECT_EQ(bare({"--nonsense"}).err, "korvex-records: --nonsense: unknown option\n");
 }
 
 TEST_F(HelpTest, TheManualPageTellsEachVerbAndOption) {
@@ -69,15 +136,17 @@ TEST_F(HelpTest, TheManualPageTellsEachVerbAndOption) {
 TEST_F(HelpTest, BothShellsCompleteEachVerbAndOption) {
     const std::string bash = readFile(kFolder + "completion/korvex-records.bash");
     const std::string zsh = readFile(kFolder + "completion/_korvex-records");
-    EXPECT_THAT(bash, HasSubstr("'list get put remove dump load check diff stats'"));
-    for (const std::string& verb : verbs())
+    for (const std::string& verb : verbs()) {
+        EXPECT_THAT(bash, testing::ContainsRegex("[' ]" + verb + "[' \n]")) << verb;
         EXPECT_THAT(zsh, HasSubstr("\n        '" + verb + ":")) << verb;
+    }
     const std::size_t words = bash.find("compgen -W '--");
     for (const std::string& option : options()) {
         EXPECT_THAT(bash.substr(words, bash.find("' --", words) - words), HasSubstr(option))
             << option;
-        EXPECT_THAT(zsh, testing::AnyOf(HasSubstr(option + "=}'["), HasSubstr(option + "}'["),
-                                        HasSubstr("'" + option + "[")))
+        EXPECT_THAT(zsh,
+                    testing::AnyOf(HasSubstr(option + "=}'["), HasSubstr(option + "}'["),
+                                   HasSubstr("'" + option + "["), HasSubstr("'" + option + "=[")))
             << option;
     }
 }

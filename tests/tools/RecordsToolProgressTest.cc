@@ -12,7 +12,6 @@ namespace {
 using namespace testsupport;
 using testing::HasSubstr;
 using testing::Not;
-using testing::StartsWith;
 
 constexpr int kNone = -1;
 
@@ -46,12 +45,12 @@ class ProgressTest : public RecordsToolTest {
 
     ProgressTest() {
         writeFile(data, fileOf({{"a", "1"}}));
-        // What the set-up says would stand before what is looked at.
         writeFile(dir.file("home/etc/log-cmdline.cfg"), "log4cpp.rootCategory=EMERG\n");
+        writeFile(dir.file("dump"), "VERSION=3\nHEADER=END\n 62\n 32\nDATA=END\n");
     }
-    // Keeps the tool's runs waiting.
+    // Keeps the tool's runs that write waiting.
     void holdLock() {
-        _lock = open((data + ".lock").c_str(), O_RDONLY | O_CREAT | O_CLOEXEC, 0600);
+        _lock = open(data.c_str(), O_RDONLY | O_CLOEXEC);
         ASSERT_EQ(flock(_lock, LOCK_EX), 0);
     }
     void releaseLock() const {
@@ -63,11 +62,11 @@ class ProgressTest : public RecordsToolTest {
     int _lock = -1;
 };
 
-// What stays to be seen, below the line that the set-up writes.
+// What stays to be seen.
 std::string left(const std::string& shown) {
     std::vector<std::string> lines(1);
     std::size_t column = 0;
-    for (const char c : shown.substr(shown.find('\n') + 1)) {
+    for (const char c : shown) {
         if (c == '\n') lines.emplace_back();
         if (c == '\n' || c == '\r') {
             column = 0;
@@ -83,11 +82,13 @@ std::string left(const std::string& shown) {
     return screen;
 }
 
-TEST_F(ProgressTest, WorkOfMoreThanASecondIsShownAndTheLineIsGoneAtTheEnd) {
-    writeFile(dir.file("dump"), "VERSION=3\nHEADER=END\n 62\n 32\nDATA=END\n");
-    writeFile(dir.file("other"), fileOf({{"a", "1"}}));
-    for (const std::vector<std::string>& arguments : std::vector<std::vector<std::string>>{
-             {"dump"}, {"stats"}, {"diff", dir.file("other")}, {"load", dir.file("dump")}}) {
+TEST_F(ProgressTest, WaitingForMoreThanASecondIsShownAndTheLineIsGoneAtTheEnd) {
+    writeFile(dir.file("batch"), "remove\ta\n");
+    for (const std::vector<std::string>& arguments :
+         std::vector<std::vector<std::string>>{{"put", "c", "3"},
+                                               {"load", dir.file("dump")},
+                                               {"remove", "b", "c"},
+                                               {"batch", dir.file("batch")}}) {
         holdLock();
         const auto start = std::chrono::steady_clock::now();
         Run work(*this, arguments);
@@ -97,19 +98,24 @@ TEST_F(ProgressTest, WorkOfMoreThanASecondIsShownAndTheLineIsGoneAtTheEnd) {
         EXPECT_EQ(work.end(), 0) << arguments[0];
         EXPECT_EQ(left(work.terminal.shown()), "\n") << arguments[0];
     }
+    EXPECT_EQ(stored(), fileOf({}));
 }
 
 // Opening a file waits for whoever has a lease of it.
-TEST_F(ProgressTest, CheckShowsHowFarItIs) {
+TEST_F(ProgressTest, EachReadingVerbShowsHowFarItIs) {
     std::signal(SIGIO, SIG_IGN);
-    const int fd = open(data.c_str(), O_RDONLY | O_CLOEXEC);
-    ASSERT_EQ(fcntl(fd, F_SETLEASE, F_WRLCK), 0);
-    Run check(*this, {"check"});
-    EXPECT_TRUE(check.terminal.shows("\rscanning [" + std::string(40, '.') + "]   0%"));
-    EXPECT_EQ(fcntl(fd, F_SETLEASE, F_UNLCK), 0);
-    EXPECT_EQ(check.end(), 0);
-    EXPECT_EQ(left(check.terminal.shown()), "\n");
-    close(fd);
+    for (const std::vector<std::string>& arguments : std::vector<std::vector<std::string>>{
+             {"check"}, {"list"}, {"get", "a"}, {"dump"}, {"stats"}, {"diff", data}, {"salvage"}}) {
+        const int fd = open(data.c_str(), O_RDONLY | O_CLOEXEC);
+        ASSERT_EQ(fcntl(fd, F_SETLEASE, F_WRLCK), 0);
+        Run read(*this, arguments);
+        EXPECT_TRUE(read.terminal.shows("\rreading [" + std::string(40, '.') + "]   0%"))
+            << arguments[0];
+        EXPECT_EQ(fcntl(fd, F_SETLEASE, F_UNLCK), 0);
+        EXPECT_EQ(read.end(), 0);
+        EXPECT_EQ(left(read.terminal.shown()), "\n");
+        close(fd);
+    }
     std::signal(SIGIO, SIG_DFL);
 }
 
@@ -130,34 +136,32 @@ TEST_F(ProgressTest, WhoTypesADumpIsNotDisturbed) {
     Terminal keyboard;
     Run typed(*this, {"load"}, open(keyboard.name().c_str(), O_RDONLY | O_NOCTTY | O_CLOEXEC));
     holdLock();
-    Run other(*this, {"dump"});
+    Run other(*this, {"put", "c", "3"});
     ASSERT_TRUE(other.terminal.shows("waiting"));
     releaseLock();
     keyboard.type("VERSION=3\nHEADER=END\n 62\n 32\nDATA=END\n\004");
     EXPECT_EQ(typed.end(), 0);
     EXPECT_EQ(other.end(), 0);
-    EXPECT_THAT(typed.terminal.shown(), Not(HasSubstr("reading")));
-    EXPECT_EQ(stored(), fileOf({{"a", "1"}, {"b", "2"}}));
+    EXPECT_THAT(typed.terminal.shown(), Not(HasSubstr("reading the")));
+    EXPECT_EQ(stored(), fileOf({{"a", "1"}, {"b", "2"}, {"c", "3"}}));
 }
 
 TEST_F(ProgressTest, WhatIsSaidMeanwhileStandsOnALineOfItsOwn) {
-    writeFile(dir.file("other"), "\5");
     holdLock();
-    Run diff(*this, {"diff", dir.file("other")});
-    ASSERT_TRUE(diff.terminal.shows("waiting"));
+    Run remove(*this, {"remove", "none"});
+    ASSERT_TRUE(remove.terminal.shows("waiting"));
     releaseLock();
-    EXPECT_EQ(diff.end(), 3);
-    EXPECT_THAT(left(diff.terminal.shown()),
-                StartsWith("korvex-records: " + dir.file("other") + ": damaged"));
+    EXPECT_EQ(remove.end(), 1);
+    EXPECT_EQ(left(remove.terminal.shown()), "korvex-records: none: no such key\n\n");
 }
 
 TEST_F(ProgressTest, TheOutputOnTheSameTerminalStandsOnLinesOfItsOwn) {
     holdLock();
-    Run stats(*this, {"stats"}, kNone, STDERR_FILENO);
-    ASSERT_TRUE(stats.terminal.shows("waiting"));
+    Run load(*this, {"load", dir.file("dump")}, kNone, STDERR_FILENO);
+    ASSERT_TRUE(load.terminal.shows("waiting"));
     releaseLock();
-    EXPECT_EQ(stats.end(), 0);
-    EXPECT_THAT(left(stats.terminal.shown()), StartsWith("1 records\n"));
+    EXPECT_EQ(load.end(), 0);
+    EXPECT_EQ(left(load.terminal.shown()), "1 record added, 0 changed, 0 removed\n\n");
 }
 
 TEST_F(ProgressTest, WithoutATerminalNothingIsShown) {
@@ -168,9 +172,9 @@ TEST_F(ProgressTest, WithoutATerminalNothingIsShown) {
         alarm(60);
         dup2(open("/dev/null", O_WRONLY), STDOUT_FILENO);
         dup2(open(err.c_str(), O_WRONLY | O_CREAT, 0600), STDERR_FILENO);
-        _exit(execTool({"dump"}));
+        _exit(execTool({"put", "b", "2"}));
     }
-    Run later(*this, {"dump"});
+    Run later(*this, {"put", "c", "3"});
     ASSERT_TRUE(later.terminal.shows("waiting"));
     releaseLock();
     int status = -1;

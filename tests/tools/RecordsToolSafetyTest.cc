@@ -54,7 +54,9 @@ TEST_P(KilledWriting, LeavesTheOldFileOrTheNewOneAndTheNextRunFindsIt) {
     const std::string after = fileOf(GetParam().after);
     writeFile(dir.file("dump"), "VERSION=3\nHEADER=END\n 62\n 32\nDATA=END\n");
     std::vector<std::string> arguments = GetParam().arguments;
+    writeFile(dir.file("batch"), "put\tb\t2\nremove\ta\n");
     if (arguments[0] == "load") arguments.push_back(dir.file("dump"));
+    if (arguments[0] == "batch") arguments.push_back(dir.file("batch"));
     bool ended = false;
     bool sawAfter = false;
     int k = 0;
@@ -67,12 +69,13 @@ TEST_P(KilledWriting, LeavesTheOldFileOrTheNewOneAndTheNextRunFindsIt) {
         if (k % 16 == 0) {
             ASSERT_EQ(run({"check"}).status, 0) << "killed at stop " << k;
         }
+        ASSERT_LE(beside().size(), 2U) << "the next run tidies up";
         ASSERT_TRUE(stored() == left);
     }
     std::printf("[  killed  ] %s: %d times\n", GetParam().name, k - 1);
     EXPECT_TRUE(sawAfter);
     EXPECT_TRUE(stored() == after);
-    EXPECT_THAT(beside(), ElementsAre("data", "data.lock")) << "the run that ended tidies up";
+    EXPECT_THAT(beside(), ElementsAre("data")) << "the run that ended tidies up";
 }
 
 INSTANTIATE_TEST_SUITE_P(
@@ -81,66 +84,23 @@ INSTANTIATE_TEST_SUITE_P(
                             {"put", "b", std::string(9000, 'x')},
                             {{"a", "1"}, {"b", std::string(9000, 'x')}, {"c", "3"}}},
                     Writing{"remove", {"remove", "a", "c"}, {}},
+                    Writing{"batch", {"batch"}, {{"b", "2"}, {"c", "3"}}},
+                    Writing{"replace", {"load", "--replace"}, {{"b", "2"}}},
                     Writing{"load", {"load"}, {{"a", "1"}, {"b", "2"}, {"c", "3"}}}),
     [](const auto& writing) { return std::string(writing.param.name); });
-
-TEST_F(SafetyTest, TheCopyOfAKilledRunDoesNotReplaceAWholeFile) {
-    const std::string newer = fileOf({{"a", "1"}, {"b", "2"}});
-    writeFile(data, newer);
-    writeFile(data + ".copy", fileOf({{"a", "1"}}));
-    EXPECT_EQ(run({"list"}).status, 0);
-    EXPECT_EQ(stored(), newer);
-    EXPECT_EQ(run({"put", "c", "3"}).status, 0);
-    EXPECT_EQ(stored(), fileOf({{"a", "1"}, {"b", "2"}, {"c", "3"}}));
-    EXPECT_THAT(beside(), ElementsAre("data", "data.lock"));
-}
-
-TEST_F(SafetyTest, ADamagedCopyIsNotPutBack) {
-    const std::string damaged = fileOf({{"a", "1"}}) + "\5";
-    writeFile(data, damaged);
-    writeFile(data + ".copy", fileOf({{"b", "1"}}) + "\5");
-    EXPECT_EQ(run({"list"}).status, 3);
-    EXPECT_EQ(stored(), damaged);
-}
-
-TEST_F(SafetyTest, WhatAKilledRunSavedAsideIsNotTakenForTheNext) {
-    writeFile(data + ".new", fileOf({{"x", "1"}}));
-    writeFile(data + ".copy.unfinished", "half");
-    EXPECT_EQ(run({"put", "a", "1"}).status, 0);
-    EXPECT_EQ(stored(), fileOf({{"a", "1"}}));
-}
-
-TEST_F(SafetyTest, APlantedLinkIsNotWrittenThrough) {
-    const std::string victim = dir.file("victim");
-    for (const char* name : {".new", ".copy.unfinished", ".copy"}) {
-        writeFile(victim, "precious");
-        writeFile(data, fileOf({{"a", "1"}}));
-        ASSERT_TRUE(Pathname(victim).symlinkTo(Pathname(data + name)));
-        EXPECT_EQ(run({"put", "b", "2"}).status, 0) << name;
-        EXPECT_EQ(readFile(victim), "precious") << name;
-        EXPECT_EQ(stored(), fileOf({{"a", "1"}, {"b", "2"}})) << name;
-        EXPECT_THAT(beside(), ElementsAre("data", "data.lock")) << name;
-    }
-}
-
-TEST_F(SafetyTest, ALinkInTheLocksPlaceMakesNoFileAndLetsNobodyWrite) {
-    writeFile(data, fileOf({{"a", "1"}}));
-    ASSERT_TRUE(Pathname(dir.file("elsewhere")).symlinkTo(Pathname(data + ".lock")));
-    EXPECT_EQ(run({"put", "b", "2"}).status, 4);
-    EXPECT_FALSE(Pathname(dir.file("elsewhere")).exists());
-    EXPECT_EQ(stored(), fileOf({{"a", "1"}}));
-    EXPECT_EQ(run({"get", "a"}).out, "1");
-}
 
 TEST_F(SafetyTest, AFifoOrADeviceDoesNotHoldTheToolUp) {
     const std::string fifo = dir.file("fifo");
     ASSERT_EQ(mkfifo(fifo.c_str(), 0600), 0);
-    // By a link of our own, so that the lock is made here and not in /dev.
-    const std::string zero = dir.file("zero");
-    ASSERT_TRUE(Pathname("/dev/zero").symlinkTo(Pathname(zero)));
-    for (const char* verb : {"list", "check"}) {
+    const std::string zero = "/dev/zero";
+    for (const char* verb : {"list", "check", "stats", "salvage"}) {
         EXPECT_EQ(run({"-f", fifo, verb}).status, 4);
         EXPECT_EQ(run({"-f", zero, verb}).status, 4);
+    }
+    for (const std::string& file : {fifo, zero, dir.path()}) {
+        const ChildResult result = run({"-f", file, "put", "a", "1"});
+        EXPECT_EQ(result.status, 4);
+        EXPECT_EQ(result.err, "korvex-records: " + file + ": no regular file\n");
     }
 }
 
@@ -159,7 +119,7 @@ TEST_F(SafetyTest, AFileSizeLimitIsAFailedSaveAndNoDeath) {
         });
         EXPECT_EQ(result.status, 4) << limit;
         EXPECT_TRUE(stored() == before);
-        EXPECT_THAT(beside(), ElementsAre("data", "data.lock"));
+        EXPECT_THAT(beside(), ElementsAre("data"));
     }
 }
 
@@ -172,7 +132,7 @@ TEST_F(SafetyTest, AFailedFirstSaveLeavesNoFile) {
                   })
                   .status,
               4);
-    EXPECT_THAT(beside(), ElementsAre("data.lock"));
+    EXPECT_THAT(beside(), testing::IsEmpty());
 }
 
 TEST_F(SafetyTest, ASaveKeepsTheModeAndFollowsLinks) {
@@ -221,17 +181,44 @@ TEST_F(SafetyTest, ClosedStreamsHarmNothing) {
     EXPECT_EQ(run({"get", "a"}, "", [] { dup2(open("/dev/full", O_WRONLY), 2); }).out, "1");
 }
 
-TEST_F(SafetyTest, AReaderThatIsGoneIsLostOutput) {
+// A pipe that nobody reads.
+void toNobody() {
+    int ends[2];
+    if (pipe(ends) != 0) _exit(99);
+    dup2(ends[1], 1);
+    close(ends[0]);
+}
+
+TEST_F(SafetyTest, AReaderThatIsGoneEndsReadingSilentlyByTheSignal) {
     EXPECT_EQ(run({"put", "a", std::string(100000, 'x')}).status, 0);
-    EXPECT_EQ(run({"get", "a"}, "",
-                  [] {
-                      int ends[2];
-                      if (pipe(ends) != 0) _exit(99);
-                      dup2(ends[1], 1);
-                      close(ends[0]);
-                  })
-                  .status,
-              4);
+    for (const std::vector<std::string>& arguments : std::vector<std::vector<std::string>>{
+             {"get", "a"}, {"list"}, {"dump"}, {"check"}, {"stats"}, {"--help"}}) {
+        const ChildResult result = run(arguments, "", [] {
+            signal(SIGPIPE, SIG_DFL);
+            toNobody();
+        });
+        EXPECT_EQ(result.signal, SIGPIPE) << arguments[0];
+        EXPECT_EQ(result.err, "") << arguments[0];
+    }
+}
+
+TEST_F(SafetyTest, WhoIgnoresTheSignalIsToldThatTheOutputIsLost) {
+    writeFile(data, fileOf({{"a", "1"}}));
+    const ChildResult result = run({"get", "a"}, "", [] {
+        signal(SIGPIPE, SIG_IGN);
+        toNobody();
+    });
+    EXPECT_EQ(result.status, 4);
+    EXPECT_EQ(result.err, "korvex-records: standard output: Broken pipe\n");
+}
+
+TEST_F(SafetyTest, AReaderThatIsGoneEndsNoChange) {
+    const ChildResult result = run({"batch"}, "put\ta\t1\n", [] {
+        signal(SIGPIPE, SIG_DFL);
+        toNobody();
+    });
+    EXPECT_EQ(result.status, 4);
+    EXPECT_EQ(stored(), fileOf({{"a", "1"}}));
 }
 
 TEST_F(SafetyTest, LostHelpIsNoticed) {

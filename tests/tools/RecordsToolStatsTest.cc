@@ -49,7 +49,7 @@ TEST_F(StatsTest, DamageIsTold) {
     writeFile(data, fileOf({{"a", "1"}}) + "\5");
     const ChildResult result = run({"stats"});
     EXPECT_EQ(result.status, 3);
-    EXPECT_THAT(result.out, HasSubstr("1 records\n"));
+    EXPECT_THAT(result.out, HasSubstr("1 record\n"));
     EXPECT_THAT(result.err, HasSubstr("damaged at offset 41"));
 }
 

@@ -1,25 +1,48 @@
 #include "Configuration.h"
 
 #include <algorithm>
-#include <cerrno>
-#include <cstring>
+#include <cstdio>
+#include <new>
+#include <utility>
 
-#include "Status.h"
 #include "Text.h"
 #include "base/Stream.h"
+#include "util/Logger/AppenderRegistry.h"
+#include "util/Logger/ChannelRegistry.h"
+#include "util/Logger/LoggingLock.h"
 #include "util/Logger/RootObjects.h"
 
 namespace {
 
-[[noreturn]] void unreadable(const Pathname& file) {
-    const int error = errno;
-    throw Failure("cannot read " + printable(file) + ": " + std::strerror(error));
+// Forgets what an earlier configuration made. The two layouts that have names stay.
+void forget() {
+    {
+        ChannelRegistry& registry = ChannelRegistry::instance();
+        const LoggingLock lock(registry.mutex);
+        registry.channels.clear();
+    }
+    rootChannel().setConfig("INFO rootAppender");
+    appenders().clear();
+    for (const auto& [attribute, value] :
+         {std::pair("fileName", ""), std::pair("maxFileSize", "0"),
+          std::pair("maxBackupIndex", "0"), std::pair("layout", "SimpleLayout"),
+          std::pair("layout", "BasicLayout")}) {
+        rootAppender().setAttribute(attribute, value, Pathname());
+    }
+    layouts().resize(2);
+    rootAppender().setAttribute("layout.ConversionPattern", "%m%n", Pathname());
 }
 
-template <class Item>
-Item* named(std::vector<Item>& items, const std::string& name) {
+// (Not every system makes a stream of no bytes.)
+Stream streamOf(const std::string& text) {
+    if (text.empty()) return Stream(std::fopen("/dev/null", "r"));
+    return Stream(fmemopen(const_cast<char*>(text.data()), text.size(), "r"));
+}
+
+template <class Items>
+auto named(Items& items, const std::string& name) -> decltype(&items.front()) {
     const auto found = std::find_if(items.begin(), items.end(),
-                                    [&](const Item& item) { return item.name == name; });
+                                    [&](const auto& item) { return item.name == name; });
     return found == items.end() ? nullptr : &*found;
 }
 
@@ -28,10 +51,16 @@ void hearAppender(Configuration& config, const ConfigStatement& said) {
     Appender* known =
         made == &rootAppender() ? &config.rootAppender : named(config.appenders, said.name);
     if (known == nullptr) {
-        config.appenders.push_back({said.name, said.lineno, made, {}, {}});
+        config.appenders.push_back({said.name, said.lineno, made, {}, {}, {}});
         known = &config.appenders.back();
     }
-    if (said.kind == ConfigStatement::ATTRIBUTE) known->attributes.push_back(said);
+    if (said.kind == ConfigStatement::APPENDER) {
+        known->declarations.push_back(said.lineno);
+    } else {
+        // What was heard of first was only the name in front of the attribute.
+        known->declarations.pop_back();
+        known->attributes.push_back(said);
+    }
 }
 
 void hearCategory(Configuration& config, const ConfigStatement& said) {
@@ -55,25 +84,30 @@ void hear(Configuration& config, const ConfigStatement& said) {
 
 }  // namespace
 
-Configuration Configuration::read(const Pathname& file, const Pathname& home) {
+Configuration Configuration::read(const std::string& text, const Pathname& home) {
     epoch_timeval();
+    forget();
     Configuration config;
     config.root.made = &rootChannel();
     config.rootAppender.name = "rootAppender";
     config.rootAppender.made = &::rootAppender();
-    const Stream stream(file.fopen("r"));
-    if (!stream) unreadable(file);
+    const Stream stream = streamOf(text);
+    if (!stream) throw std::bad_alloc();
     ConfigReader reader(stream.get(), home);
     reader.setListener([&](const ConfigStatement& said) { hear(config, said); });
     reader.readAll();
-    if (std::ferror(stream.get()) != 0) unreadable(file);
     reader.applyRoot();
     reader.applyCategories();
     for (Appender& appender : config.appenders)
         appender.complaints = LogAppender::find(appender.name, false)->settle();
-    config.parseErrors = reader.parse_errors();
+    for (const DeferedLogConf& error : reader.parse_errors())
+        config.parseErrors.emplace(error.lineno, error.context);
     config.openComment = reader.xml_comment_startline();
     return config;
+}
+
+bool Configuration::hasAppender(const std::string& name) const {
+    return LogAppender::find(name, false) != nullptr;
 }
 
 const Appender* Configuration::appenderOf(const LogAppender* made) const {
@@ -98,6 +132,16 @@ std::vector<const Appender*> Configuration::everyAppender() const {
     for (const Appender& appender : appenders)
         all.push_back(&appender);
     all.push_back(&rootAppender);
+    return all;
+}
+
+std::vector<const ConfigStatement*> Configuration::appliedValues() const {
+    std::vector<const ConfigStatement*> all;
+    if (!root.statements.empty()) all.push_back(&root.statements.back());
+    for (const Channel& category : categories) {
+        for (const ConfigStatement& said : category.statements)
+            all.push_back(&said);
+    }
     return all;
 }
 

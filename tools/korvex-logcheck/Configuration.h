@@ -2,6 +2,7 @@
 
 #include <korvex/util/Logger.h>
 
+#include <map>
 #include <string>
 #include <vector>
 
@@ -13,6 +14,7 @@ struct Appender {
     unsigned lineno;  // where it is first named
     const LogAppender* made;
     std::vector<ConfigStatement> attributes;
+    std::vector<unsigned> declarations;   // the lines "appender.NAME=..."
     std::vector<const char*> complaints;  // what every start of a program would say of it
 };
 
@@ -26,9 +28,11 @@ struct Channel {
 
 // What a configuration comes to, as the library reads it. No log file is opened.
 struct Configuration {
-    // Throws Failure when the file cannot be read. Once per process: appenders and channels are
-    // the process's own.
-    static Configuration read(const Pathname& file, const Pathname& home);
+    // Appenders and channels are the process's own, so what was read before is gone with this.
+    static Configuration read(const std::string& text, const Pathname& home);
+
+    // Whether a category may name it.
+    bool hasAppender(const std::string& name) const;
 
     const Appender* appenderOf(const LogAppender* made) const;
     // Where the channel's messages go, in order: never empty.
@@ -36,15 +40,18 @@ struct Configuration {
     static bool writesTo(const LogChannel& channel, const LogAppender& appender);
     // The appenders, and the root appender last.
     std::vector<const Appender*> everyAppender() const;
+    // The lines that set the root's level and appenders, and the categories'.
+    std::vector<const ConfigStatement*> appliedValues() const;
+    bool isRefused(unsigned lineno) const { return parseErrors.count(lineno) > 0; }
     // The names of the channels that write to it.
     std::vector<std::string> users(const LogAppender& appender) const;
     // "MAIN", or "rootAppender".
     std::string nameOf(const LogAppender* made) const;
 
     Channel root;
-    std::vector<Channel> categories;  // in the order in which they come into being
-    std::vector<Appender> appenders;  // in the file's order
-    Appender rootAppender;            // not among the others
-    DeferedLogConfList parseErrors;
-    unsigned openComment = ConfigLines::kNone;  // the line of a comment that never ends
+    std::vector<Channel> categories;              // in the order in which they come into being
+    std::vector<Appender> appenders;              // in the file's order
+    Appender rootAppender;                        // not among the others
+    std::map<unsigned, std::string> parseErrors;  // by line: what the library quotes
+    unsigned openComment = ConfigLines::kNone;    // the line of a comment that never ends
 };

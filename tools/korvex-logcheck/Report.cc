@@ -90,10 +90,6 @@ void reportAppender(const Configuration& config, const Appender& appender) {
     write("\n");
 }
 
-std::string counted(std::size_t count, const std::string& what) {
-    return std::to_string(count) + ' ' + what + (count == 1 ? "" : "s");
-}
-
 }  // namespace
 
 void reportAll(const Configuration& config) {
@@ -122,17 +118,4 @@ void reportChannel(const Configuration& config, const std::string& name) {
         }
     }
     write("\n");
-}
-
-void reportFindings(const Pathname& file, const Findings& findings) {
-    std::size_t errors = 0;
-    for (const Finding& finding : findings) {
-        if (finding.isError) ++errors;
-        write(printable(file) + ':' + std::to_string(finding.lineno) + ": ");
-        write(finding.isError ? "error: " : "warning: ",
-              finding.isError ? Ink::ERROR : Ink::WARNING);
-        write(finding.text + '\n');
-    }
-    if (findings.empty()) return write("no errors, no warnings\n");
-    write(counted(errors, "error") + ", " + counted(findings.size() - errors, "warning") + '\n');
 }

@@ -2,7 +2,7 @@
 
 #include <string>
 
-#include "Findings.h"
+#include "Configuration.h"
 
 // Each writes its part to standard output.
 
@@ -10,5 +10,3 @@
 void reportAll(const Configuration& config);
 // Where a message of each level lands that is logged on this channel.
 void reportChannel(const Configuration& config, const std::string& name);
-// "FILE:LINE: error: ..." and the like, and how many there are of each.
-void reportFindings(const Pathname& file, const Findings& findings);

@@ -1,7 +1,10 @@
 #include "Sample.h"
 
 #include <algorithm>
+#include <ctime>
 #include <exception>
+
+#include "PatternText.h"
 
 namespace {
 
@@ -10,6 +13,20 @@ LogLevel sampleLevel(const LogChannel& channel) {
         if (channel.passes(level)) return level;
     }
     return EMERG;
+}
+
+Timeval sampleTime() {
+    struct tm local {};
+    local.tm_year = 107;
+    local.tm_mon = 2;
+    local.tm_mday = 5;
+    local.tm_hour = 14;
+    local.tm_min = 3;
+    local.tm_sec = 9;
+    local.tm_isdst = -1;
+    Timeval time;
+    time.set(static_cast<int>(std::mktime(&local)), 7000);
+    return time;
 }
 
 // Whether the pattern pads something to a width of six digits and more: surely a slip, and not
@@ -25,19 +42,44 @@ bool isHuge(const std::string& pattern) {
     return false;
 }
 
+// What the conversions print that change from one moment to the next; null: another one.
+const char* fixedText(char letter) {
+    if (letter == 'r') return "2500";
+    if (letter == 'R') return "2";
+    return letter == 'u' ? "10000" : nullptr;
+}
+
+// The pattern with those conversions already laid out.
+std::string fixedPattern(const std::string& pattern, const LogMsgMetadata& md) {
+    std::string fixed;
+    for (const PatternPart& part : partsOf(pattern)) {
+        const char* const text =
+            part.kind == PatternPart::CONVERSION ? fixedText(part.letter) : nullptr;
+        if (text == nullptr) {
+            fixed += part.in(pattern);
+            continue;
+        }
+        const std::string widths = pattern.substr(part.begin, part.letterAt - part.begin);
+        LogFormat((widths + 'm').c_str()).apply(fixed, md, text);
+    }
+    return fixed;
+}
+
 }  // namespace
 
 Sample sampleLine(const LogAppender& appender, const std::string& channelName,
                   const LogChannel& channel) {
     const Logger logger(channelName.c_str());
+    const std::string& pattern = appender.layout().pattern();
     Sample sample;
-    if (isHuge(appender.layout().pattern())) {
-        sample.failure = "asks for a width of six digits";
+    if (isHuge(pattern)) {
+        sample.failure = kTooWide;
         return sample;
     }
+    LogMsgMetadata md(&logger, sampleLevel(channel));
+    md.stamp = sampleTime();
     try {
-        appender.layout().apply(sample.line, LogMsgMetadata(&logger, sampleLevel(channel)),
-                                "this is a message");
+        LogFormat(fixedPattern(pattern, md).c_str()).apply(sample.line, md, "this is a message");
     } catch (const std::exception& e) {
         sample.failure = std::string("fails, so messages go to standard error: ") + e.what();
     }

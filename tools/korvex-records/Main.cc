@@ -1,3 +1,4 @@
+#include <korvex/Version.h>
 #include <korvex/util/LoaderInfo.h>
 
 #include <fcntl.h>
@@ -5,10 +6,13 @@
 
 #include <csignal>
 #include <cstdio>
+#include <cstdlib>
 #include <exception>
 
-#include "Commands.h"
+#include "commands/Commands.h"
 #include "support/StandardOutput.h"
+#include "terminal/Output.h"
+#include "terminal/Progress.h"
 
 namespace {
 
@@ -22,27 +26,52 @@ void fillStandardDescriptors() {
     }
 }
 
-// What the set-up prints is for people: it goes to standard error, so that standard output holds
-// just what was asked for.
-void setUp(int argc, char** argv, char** envp) {
-    fillStandardDescriptors();
-    // A reader that is gone and a file size limit are told by the write that fails.
-    std::signal(SIGPIPE, SIG_IGN);
-    std::signal(SIGXFSZ, SIG_IGN);
+// Where what the set-up prints should go: it is for people. Without a home it is the reason why the
+// set-up ends the tool.
+int asideOf(const Options& options) {
+    const char* const home = std::getenv("KORVEX_HOME");
+    const bool isTold = options.verbose || home == nullptr || *home == '\0';
+    return isTold ? fcntl(STDERR_FILENO, F_DUPFD_CLOEXEC, STDERR_FILENO + 1)
+                  : open("/dev/null", O_WRONLY | O_CLOEXEC);
+}
+
+// Standard output holds just what was asked for.
+void setUp(const Options& options, int argc, char** argv, char** envp) {
     const int out = fcntl(STDOUT_FILENO, F_DUPFD_CLOEXEC, STDERR_FILENO + 1);
-    if (out < 0 || dup2(STDERR_FILENO, STDOUT_FILENO) < 0) {
+    const int aside = asideOf(options);
+    if (out < 0 || aside < 0 || dup2(aside, STDOUT_FILENO) < 0) {
         throw Failure(IO_ERROR, withErrno("cannot turn standard output aside"));
     }
     LoaderInfo::common_main_setup(argc, argv, envp);
     std::fflush(stdout);
     dup2(out, STDOUT_FILENO);
     close(out);
+    close(aside);
 }
 
-Status run(int argc, char** argv) {
+// Whether the command line asked for nothing but words about the tool.
+bool tellsOfItself(const Options& options) {
+    const Command* const command =
+        options.words.empty() ? nullptr : commandOf(options.words.front());
+    if (options.help && command != nullptr) write(helpText(*command));
+    if (options.help && command == nullptr) write(helpText());
+    if (!options.help && options.version) write("korvex-records " KORVEX_VERSION_STRING "\n");
+    return options.help || options.version;
+}
+
+Status run(int argc, char** argv, char** envp) {
     const Options options = parseOptions(argc, argv);
-    const Command& command = findCommand(options);
-    const Status status = command.run(options, {options.words.begin() + 1, options.words.end()});
+    Status status = DONE;
+    if (!tellsOfItself(options)) {
+        const Command& command = findCommand(options);
+        // A reader that is gone ends what only reads, as it does other tools. It must not end a
+        // change in its middle; then the write that fails tells.
+        if (command.writes) std::signal(SIGPIPE, SIG_IGN);
+        std::signal(SIGXFSZ, SIG_IGN);
+        if (command.run != runHelp) setUp(options, argc, argv, envp);
+        const ProgressDisplay display;
+        status = command.run(options, {options.words.begin() + 1, options.words.end()});
+    }
     finishOutput();
     return status;
 }
@@ -51,8 +80,8 @@ Status run(int argc, char** argv) {
 
 int main(int argc, char** argv, char** envp) {
     try {
-        setUp(argc, argv, envp);
-        return run(argc, argv);
+        fillStandardDescriptors();
+        return run(argc, argv, envp);
     } catch (const Failure& failure) {
         complain(failure.what());
         return failure.status();

@@ -1,69 +1,126 @@
 #include "Options.h"
 
-#include <vector>
+#include <algorithm>
+#include <charconv>
 
 #include "Status.h"
+#include "Suggestion.h"
 #include "support/CommandLine.h"
 
 namespace {
 
-enum Action { VERSION = 'V', HELP = '?', FILE_NAME = 'f', INPUT = 'i' };
+constexpr int kFirst = 1000;  // what popt says for the first one; letters are below
 
 struct Received {
-    int longList = 0;
-    int nulSeparated = 0;
-    int hex = 0;
-    int print = 0;
-    int create = 0;
-    int force = 0;
+    std::string name;
+    std::string argument;
 };
 
-std::vector<poptOption> optionTable(Received& to) {
-    return {
-        {"file", 'f', POPT_ARG_STRING, nullptr, FILE_NAME, "use this record file", "FILE"},
-        {"long", 'l', POPT_ARG_NONE, &to.longList, 0, "list, diff: with the values' sizes",
-         nullptr},
-        {"null", '0', POPT_ARG_NONE, &to.nulSeparated, 0, "list: raw keys, each ended by a NUL",
-         nullptr},
-        {"hex", 'x', POPT_ARG_NONE, &to.hex, 0, "get: the value as hex digits", nullptr},
-        {"print", 'p', POPT_ARG_NONE, &to.print, 0, "dump: printable characters as they are",
-         nullptr},
-        {"input", 'i', POPT_ARG_STRING, nullptr, INPUT, "put: read the value from FILE", "FILE"},
-        {"create", '\0', POPT_ARG_NONE, &to.create, 0, "make a missing hashDb directory", nullptr},
-        {"force", '\0', POPT_ARG_NONE, &to.force, 0, "write to a damaged record file all the same",
-         nullptr},
-        {"version", '\0', POPT_ARG_NONE, nullptr, VERSION, "show the version", nullptr},
-        {"help", '?', POPT_ARG_NONE, nullptr, HELP, "show this text", nullptr},
-        {nullptr, '\0', 0, nullptr, 0, nullptr, nullptr},
-    };
+std::vector<poptOption> poptTable() {
+    std::vector<poptOption> table;
+    int number = kFirst;
+    for (const OptionText& option : optionTexts()) {
+        const unsigned kind = option.argument != nullptr ? POPT_ARG_STRING : POPT_ARG_NONE;
+        table.push_back({option.name, option.letter, kind, nullptr, number++, nullptr, nullptr});
+    }
+    table.push_back({nullptr, '?', POPT_ARG_NONE, nullptr, 'h', nullptr, nullptr});
+    table.push_back({nullptr, '\0', 0, nullptr, 0, nullptr, nullptr});
+    return table;
 }
 
-void act(int action, const CommandLine& line, Options& options) {
-    if (action == FILE_NAME) options.file = line.argument();
-    if (action == INPUT) options.input = line.argument();
-    if (action == HELP) line.showHelp();
-    if (action == VERSION) line.showVersion();
+unsigned secondsOf(const std::string& text) {
+    unsigned seconds = 0;
+    const auto [end, error] = std::from_chars(text.data(), text.data() + text.size(), seconds);
+    if (error != std::errc() || end != text.data() + text.size()) {
+        throw Failure(USAGE, "--wait: not a number of seconds: \"" + text + "\"");
+    }
+    return seconds;
+}
+
+std::string notEmpty(const Received& option) {
+    if (!option.argument.empty()) return option.argument;
+    throw Failure(USAGE, "--" + option.name + ": a file's name must not be empty");
+}
+
+void setFlag(Options& options, const std::string& name) {
+    const struct {
+        const char* name;
+        bool& flag;
+    } kFlags[] = {{"long", options.longList},
+                  {"null", options.nulSeparated},
+                  {"hex", options.hex},
+                  {"print", options.print},
+                  {"json", options.json},
+                  {"replace", options.replace},
+                  {"keep", options.keep},
+                  {"dry-run", options.dryRun},
+                  {"key-escaped", options.keyEscaped},
+                  {"any-version", options.anyVersion},
+                  {"create", options.create},
+                  {"verbose", options.verbose},
+                  {"version", options.version},
+                  {"help", options.help}};
+    for (const auto& [known, flag] : kFlags)
+        if (name == known) flag = true;
+}
+
+void accept(Options& options, const Received& option) {
+    options.given.push_back(option.name);
+    if (option.name == "file") options.file = notEmpty(option);
+    if (option.name == "input") options.input = notEmpty(option);
+    if (option.name == "output") options.output = notEmpty(option);
+    if (option.name == "value") options.value = option.argument;
+    if (option.name == "wait") options.wait = secondsOf(option.argument);
+    setFlag(options, option.name);
+}
+
+std::string unknown(const CommandLine& line, int code) {
+    const std::string word = poptBadOption(line.get(), POPT_BADOPTION_NOALIAS);
+    std::vector<std::string> names;
+    for (const OptionText& option : optionTexts())
+        names.push_back(std::string("--") + option.name);
+    const bool isUnknown = code == POPT_ERROR_BADOPT;
+    return line.complaint(code) + (isUnknown ? didYouMean(word, names) : "");
 }
 
 }  // namespace
 
+const std::vector<OptionText>& optionTexts() {
+    static const std::vector<OptionText> kTexts = {
+        {"file", 'f', "FILE", "use this record file"},
+        {"long", 'l', nullptr, "with the values' sizes"},
+        {"null", '0', nullptr, "raw keys, each ended by a NUL"},
+        {"hex", 'x', nullptr, "the value as hex digits"},
+        {"input", 'i', "FILE", "read the value from FILE; - is standard input"},
+        {"value", '\0', "TEXT", "the value, whatever it looks like"},
+        {"print", 'p', nullptr, "printable characters as they are"},
+        {"json", '\0', nullptr, "one JSON object a line"},
+        {"replace", '\0', nullptr, "remove what the dump does not hold"},
+        {"keep", '\0', nullptr, "leave the keys that are there as they are"},
+        {"dry-run", '\0', nullptr, "change nothing, only say what would be"},
+        {"output", 'o', "NEWFILE", "write what is whole to this new file"},
+        {"key-escaped", '\0', nullptr, "keys are given as list shows them"},
+        {"create", '\0', nullptr, "make a missing hashDb directory"},
+        {"wait", '\0', "SECONDS", "wait no longer for other runs"},
+        {"any-version", '\0', nullptr, "write to a file of another version, too"},
+        {"verbose", '\0', nullptr, "say which logging configuration is used"},
+        {"version", '\0', nullptr, "show the version"},
+        {"help", 'h', nullptr, "show this text, or a verb's"}};
+    return kTexts;
+}
+
 Options parseOptions(int argc, const char* const* argv) {
-    Received received;
-    const std::vector<poptOption> table = optionTable(received);
-    const CommandLine line(
-        "korvex-records", argc, argv, table.data(),
-        "[OPTION...] list|get|put|remove|dump|load|check|diff|stats [ARGUMENT...]");
+    const std::vector<poptOption> table = poptTable();
+    const CommandLine line("korvex-records", argc, argv, table.data(), "");
     Options options;
     int rc = 0;
-    while ((rc = poptGetNextOpt(line.get())) > 0)
-        act(rc, line, options);
-    if (rc != -1) throw Failure(USAGE, line.complaint(rc));
-    options.longList = received.longList != 0;
-    options.nulSeparated = received.nulSeparated != 0;
-    options.hex = received.hex != 0;
-    options.print = received.print != 0;
-    options.create = received.create != 0;
-    options.force = received.force != 0;
+    while ((rc = poptGetNextOpt(line.get())) > 0) {
+        if (rc == 'h') options.help = true;
+        if (rc < kFirst) continue;
+        accept(options,
+               {optionTexts()[static_cast<std::size_t>(rc - kFirst)].name, line.argument()});
+    }
+    if (rc != -1 && !options.help) throw Failure(USAGE, unknown(line, rc));
     if (const char** rest = poptGetArgs(line.get())) {
         while (*rest != nullptr)
             options.words.emplace_back(*rest++);

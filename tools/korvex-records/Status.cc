@@ -4,7 +4,7 @@
 #include <cstdio>
 #include <cstring>
 
-#include "Progress.h"
+#include "terminal/Progress.h"
 
 std::string withErrno(const std::string& message) {
     return message + ": " + std::strerror(errno);

@@ -77,6 +77,15 @@ class Logger {
     // Whether debug messages pass the channel: lets a caller skip building a costly text.
     bool isDebugEnabled() const;
 
+    // False where a message of that level is dropped for certain; true where it is wanted, or
+    // where that cannot be told so cheaply (before Logger::initialize). Takes two loads.
+    bool mayLog(LogLevel level) const {
+        const LogChannel* const bound = _channel.load(std::memory_order_acquire);
+        // Both hints, or g++ moves the usual case out of the way.
+        return !(__builtin_expect(bound != nullptr, true) &&
+                 __builtin_expect(!bound->passes(level), true));
+    }
+
     // The name given to the constructor.
     const char* getChannelName() const { return _channel_name; }
 
@@ -114,13 +123,9 @@ class Logger {
     friend class LogFormat;
 
     LogChannel& channel() const;
-    // False as long as no channel is bound: whether such a message is wanted takes more to know.
-    // Without the hint g++ puts the usual case out of the way, which takes a filtered call from
-    // 0.85 to 1.24 times a bare level test.
-    bool isFiltered(LogLevel level) const {
-        const LogChannel* const bound = _channel.load(std::memory_order_acquire);
-        return __builtin_expect(bound != nullptr, true) && !bound->passes(level);
-    }
+
+    // What the printf forms do once the level has passed.
+    void logFormatted(LogLevel level, const char* fmt, ...) noexcept;
 
     const char* _channel_name;
     unsigned long _channel_name_len;
@@ -128,4 +133,45 @@ class Logger {
     Logger* _next = nullptr;                     // in the list of loggers that wait
 };
 
+// g++ tests the level at the call, so that a filtered message costs no call: it can hand on the
+// arguments of a variadic function that it inlines. The library has the same bodies out of line,
+// for pointers to members, for clang++, and for programs that were compiled before. (Levels by
+// number: a program may have a macro DEBUG or ERROR.)
+#if defined(__GNUC__) && !defined(__clang__) && !defined(KORVEX_LEVEL_METHODS_OUT_OF_LINE)
+#define KORVEX_INLINE_LEVEL_METHOD(name, number)                                        \
+    extern inline __attribute__((gnu_inline, always_inline, format(printf, 2, 3))) void \
+    Logger::name(const char* fmt, ...) noexcept {                                       \
+        constexpr LogLevel level = static_cast<LogLevel>(number);                       \
+        if (mayLog(level)) logFormatted(level, fmt, __builtin_va_arg_pack());           \
+    }
+KORVEX_INLINE_LEVEL_METHOD(fatal, 7)
+KORVEX_INLINE_LEVEL_METHOD(crit, 5)
+KORVEX_INLINE_LEVEL_METHOD(error, 4)
+KORVEX_INLINE_LEVEL_METHOD(warn, 3)
+KORVEX_INLINE_LEVEL_METHOD(info, 1)
+KORVEX_INLINE_LEVEL_METHOD(debug, 0)
+#undef KORVEX_INLINE_LEVEL_METHOD
+#endif
+
 }  // KORVEX_NAMESPACE(korvex)
+
+// The printf forms as macros that do not even evaluate the arguments of a message that is dropped:
+//
+//     KORVEX_DEBUG(logger, "state: %s", describeAll().c_str());
+//
+// `logger` is an expression of type Logger, evaluated once.
+#define KORVEX_FATAL(logger, ...) KORVEX_LOG_AT(logger, fatal, 7, __VA_ARGS__)
+#define KORVEX_CRIT(logger, ...) KORVEX_LOG_AT(logger, crit, 5, __VA_ARGS__)
+#define KORVEX_ERROR(logger, ...) KORVEX_LOG_AT(logger, error, 4, __VA_ARGS__)
+#define KORVEX_WARN(logger, ...) KORVEX_LOG_AT(logger, warn, 3, __VA_ARGS__)
+#define KORVEX_INFO(logger, ...) KORVEX_LOG_AT(logger, info, 1, __VA_ARGS__)
+#define KORVEX_DEBUG(logger, ...) KORVEX_LOG_AT(logger, debug, 0, __VA_ARGS__)
+
+// Not for use as it stands.
+#define KORVEX_LOG_AT(logger, method, number, ...)                           \
+    do {                                                                     \
+        ::korvex::Logger& korvexLogger_ = (logger);                          \
+        if (korvexLogger_.mayLog(static_cast<::korvex::LogLevel>(number))) { \
+            korvexLogger_.method(__VA_ARGS__);                               \
+        }                                                                    \
+    } while (false)

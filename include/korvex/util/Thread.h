@@ -79,9 +79,10 @@ class InThreadActorQueue {
 // After fork(2) the child has none of the parent's threads: it must not join or destroy their
 // objects. It may build Threads of its own.
 //
-// Any other thread may end the process, or destroy this object after mainThreadDying(), at any
-// moment: the operating-system thread keeps its name and finds current() null then. But a main()
-// that runs on must not touch its object any more; nothing can guard that.
+// After mainThreadDying() this object may be destroyed while its operating-system thread still
+// runs: the thread keeps its name and finds current() null. But nothing can guard the object's own
+// members: once go() was called, either main() is known to have begun, and touches the object no
+// more, or the thread is joined.
 //
 // A derived class whose constructor throws leaves a thread that nobody can join: the destructor's
 // assertion ends the process. Do in main() what may fail.

@@ -62,6 +62,8 @@ class KORVEX_CAPABILITY("mutex") Mutex : public PthreadObject {
     void unlock() KORVEX_RELEASE();
     // Whether the lock was free and is now held. Any failure but "busy" is checked.
     bool tryLock() KORVEX_TRY_ACQUIRE(true);
+    // The same by the standard's name, so that std::unique_lock and std::scoped_lock take a Mutex.
+    bool try_lock() KORVEX_TRY_ACQUIRE(true) { return tryLock(); }
 
     // For code that must not log: unchecked. True when the lock is held.
     bool NOLOG_lock() KORVEX_TRY_ACQUIRE(true);

@@ -1,3 +1,5 @@
+// The bodies below are the ones out of line.
+#define KORVEX_LEVEL_METHODS_OUT_OF_LINE
 #include <korvex/util/Logger.h>
 
 #include "base/ErrnoKeeper.h"
@@ -51,7 +53,7 @@ namespace {
 
 // Here and not beside LoggingLocks, because of an archive only those files are linked that somebody
 // needs, and nobody who logs can do without this one.
-KORVEX_FIRST_AT_START_UP void keepLocksThroughForks() {
+KORVEX_REGISTERS_LOGGING_LOCKS void keepLocksThroughForks() {
     pthread_atfork(&LoggingLocks::takeAll, &LoggingLocks::freeAll, &LoggingLocks::freeAll);
 }
 
@@ -59,25 +61,31 @@ constexpr const char* percent_s = "%s";
 
 }  // namespace
 
+void Logger::logFormatted(LogLevel level, const char* fmt, ...) noexcept {
+    va_list ap;
+    va_start(ap, fmt);
+    LogFormat::do_log(this, level, fmt, ap);
+    va_end(ap);
+}
+
 // A variadic function cannot hand its arguments on without naming them, so each level has its own
-// three bodies, from this one text. Testing the level right here makes a filtered call cost a
-// quarter of what it costs through do_log.
+// three bodies, from this one text. The level is tested before anything else is done.
 #define KORVEX_LEVEL_METHODS(name, LEVEL)                 \
     void Logger::name(const char* fmt, ...) noexcept {    \
-        if (isFiltered(LEVEL)) return;                    \
+        if (!mayLog(LEVEL)) return;                       \
         va_list ap;                                       \
         va_start(ap, fmt);                                \
         LogFormat::do_log(this, LEVEL, fmt, ap);          \
         va_end(ap);                                       \
     }                                                     \
     void Logger::name(const std::string& text) noexcept { \
-        if (isFiltered(LEVEL)) return;                    \
+        if (!mayLog(LEVEL)) return;                       \
         LogFormat::do_log(this, LEVEL, text);             \
     }                                                     \
     void Logger::name(const std::exception& e) noexcept { \
+        if (!mayLog(LEVEL)) return;                       \
         const ErrnoKeeper keeper;                         \
-        if (isFiltered(LEVEL)) return;                    \
-        name(percent_s, e.what());                        \
+        logFormatted(LEVEL, percent_s, e.what());         \
     }
 
 KORVEX_LEVEL_METHODS(fatal, FATAL)

@@ -29,8 +29,8 @@ void LoggingLocks::buildAll() {
 }
 
 // In the one order in which they nest: the internal logger's building, the list of early loggers,
-// the channels, then appenders and the epoch, which hold nothing else. (They stay held beyond the
-// function, so the analysis has nothing to say.)
+// the channels, then appenders and the epoch, under which only LibcLock is taken. (They stay held
+// beyond the function, so the analysis has nothing to say.)
 void LoggingLocks::takeAll() KORVEX_NO_THREAD_SAFETY_ANALYSIS {
     buildAll();
     internalLogger().mutex().NOLOG_lock();

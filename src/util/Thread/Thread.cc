@@ -25,7 +25,7 @@ pthread_attr_t s_threadAttr;
 
 // A child of fork(2) has none of the threads that would free these. What fails under them is
 // logged, so they come before the logging system's.
-KORVEX_SECOND_AT_START_UP void keepLocksThroughForks() {
+KORVEX_REGISTERS_THREAD_LOCKS void keepLocksThroughForks() {
     pthread_atfork(&ActiveThreads::takeLocks, &ActiveThreads::freeLocks, &ActiveThreads::freeLocks);
 }
 

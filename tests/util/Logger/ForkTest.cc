@@ -155,6 +155,25 @@ TEST_F(ForkTest, NoThreadIsInTheMiddleOfLocalTimeOrOfAnErrorText) {
     }
 }
 
+// A report is put into words under the appender's lock, and asks the C library for the error's
+// text.
+TEST_F(ForkTest, AProcessForksWhileItsThreadsReportFailures) {
+    const ChildResult result = runInChild([&] {
+        LogAppender::find("bad", true)
+            ->setAttribute("fileName", _dir.file("missing/log").c_str(), Pathname());
+        LogAppender::find("good", true)
+            ->setAttribute("fileName", _dir.file("log").c_str(), Pathname());
+        LogChannel::find("test", true)->setConfig("bad");
+        LogChannel::find("Logger", true)->setConfig("good");
+        Logger::initialize();
+        Logger logger("test");
+        const Dwell dwell(Call::strerror_r, 200);
+        const Busy busy([&] { logger.info("lost"); });
+        return forkAndDo(_times, [&] { logger.info("lost"); }) == _times ? 0 : 1;
+    });
+    EXPECT_EQ(result.status, 0) << result.signal;
+}
+
 // The first line of a kind builds what all later ones share.
 class FirstLineTest : public ForkTest, public testing::WithParamInterface<Call> {};
 

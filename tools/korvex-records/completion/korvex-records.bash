@@ -37,18 +37,16 @@ _korvex_records_quoted() {
 }
 
 # Keys that begin with $3 in the file $2, by the tool $1. What a former word break has cut off, $4,
-# stays on the line, so it is no part of them. A run of the tool that is at work is not waited for.
+# stays on the line, so it is no part of them. Reading waits for nobody and changes nothing.
 _korvex_records_keys() {
     local tool=$1 file=$2 prefix=$3 before=$4 key
     tool=${tool/#\~\//$HOME/} file=${file/#\~\//$HOME/}
-    # Only the file that is there is looked into: the tool would leave a lock beside any other.
-    [[ -f ${file:-$KORVEX_DB/hashDb/data} ]] || return
     while IFS= read -r -d '' key; do
         [[ $key != -* || -n $ended ]] || continue # would pass for an option
         key=${key#"$before"}
         _korvex_records_quoted
         COMPREPLY+=("$key")
-    done < <(timeout 2 "$tool" ${file:+-f "$file"} list -0 -- "$prefix" 2> /dev/null)
+    done < <("$tool" ${file:+-f "$file"} list -0 -- "$prefix" 2> /dev/null)
     # The shell itself closes the quotes of file names only.
     [[ ${#COMPREPLY[@]} -ne 1 ]] || COMPREPLY[0]+=$quote
 }
@@ -68,9 +66,9 @@ _korvex_records() {
     for ((i = 1; i < last; i++)); do
         case $ended${typed[i]} in
             --) ended=1 ;;
-            -f | --file | -i | --input)
+            -f | --file | -i | --input | -o | --output | --value | --wait)
                 if ((++i == last)); then
-                    _korvex_records_files "$2"
+                    [[ ${typed[i - 1]} == --[vw]* ]] || _korvex_records_files "$2"
                     return
                 fi
                 [[ ${typed[i - 1]} != -*f* ]] || file=${typed[i]}
@@ -88,16 +86,18 @@ _korvex_records() {
     local before=${words[-1]}
     quote=$open
 
-    if [[ -z $ended && $current =~ ^--(file|input)= ]]; then
+    if [[ -z $ended && $current =~ ^--(file|input|output)= ]]; then
         _korvex_records_files "$2"
     elif [[ -z $ended && $current == -* ]]; then
-        mapfile -t COMPREPLY < <(compgen -W '--file --long --null --hex --print --input --create
-            --force --version --help' -- "$2")
+        mapfile -t COMPREPLY < <(compgen -W '--file --long --null --hex --input --value --print
+            --json --replace --keep --dry-run --output --key-escaped --create --wait --any-version
+            --verbose --version --help' -- "$2")
     elif [[ -z $verb ]]; then
-        mapfile -t COMPREPLY < <(compgen -W 'list get put remove dump load check diff stats' -- "$2")
+        mapfile -t COMPREPLY < <(compgen -W 'list get put remove dump load batch check diff stats
+            salvage help' -- "$2")
     else
         case $verb$count in
-            load0 | diff0) _korvex_records_files "$2" ;;
+            load0 | batch0 | diff0) _korvex_records_files "$2" ;;
             list0 | get0 | put0 | dump0 | stats0 | remove*)
                 _korvex_records_keys "$1" "$file" "$current" "$before"
                 ;;

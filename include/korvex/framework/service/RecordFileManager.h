@@ -9,6 +9,7 @@
 #include <cstdio>
 #include <memory>
 #include <string>
+#include <string_view>
 #include <vector>
 
 KORVEX_NAMESPACE(korvex) {
@@ -28,7 +29,8 @@ struct PersistentFullData {
     std::uint32_t _keySize = 0;   // its length in bytes, without the NUL
 };
 
-// A process-wide map from string keys to small opaque values, kept in memory and mirrored in one
+// A process-wide map from string keys to small opaque values (see StringStore.h for an interface
+// with strings, which leaves nothing to free), kept in memory and mirrored in one
 // record file, which is read whole and rewritten whole. All messages go to the logger
 // "recordFileManager". Errors that make the store unusable throw ComponentException; the others
 // are logged and the call returns.
@@ -109,11 +111,15 @@ class RecordFileManager {
     bool writeRecord(std::FILE* outFile, std::string key, unsigned int dataLen, const void* data);
 
   private:
+    friend class StringStore;
+
     struct State;
 
     RecordFileManager();
 
     void load(const Pathname& file, const std::string& prefix, std::string& version);
+    void enter(std::string_view key, std::string_view value);
+    bool save() const;
 
     static RecordFileManager* __pInstance;
 

@@ -11,6 +11,7 @@
 KORVEX_NAMESPACE(korvex) {
 
 class CachedTm;
+class LayoutPieces;
 class LogAppender;
 class LogChannel;
 class LogFormattedDate;
@@ -91,6 +92,7 @@ class LogFormat {
     };
     class Compiler;
     class Line;
+    friend class LayoutPieces;  // lays the atoms open, for the tools
 
     // Whether anybody wants such a message, and in *taker who: a channel, or null for standard
     // error.

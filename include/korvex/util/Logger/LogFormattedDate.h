@@ -8,6 +8,7 @@
 
 KORVEX_NAMESPACE(korvex) {
 
+class LayoutPieces;
 class LogMsgMetadata;
 
 // The broken-down local time of the one message that is being laid out, converted at most once.
@@ -56,6 +57,7 @@ class LogFormattedDate {
         unsigned long limit;    // STRFTIME: no output of the piece can be as long as this
     };
     class Scratch;
+    friend class LayoutPieces;
 
     void appendStrftime(std::string& out, Scratch& scratch, const Atom& atom, CachedTm& tm,
                         const LogMsgMetadata& md) const;

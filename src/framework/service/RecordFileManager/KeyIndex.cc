@@ -19,12 +19,12 @@ std::uint64_t mixed(std::uint64_t hash, std::uint64_t word) {
     return hash ^ (hash >> 32);
 }
 
-// Calls visit(slot) for the slots in which the key's record may lie, one after the other, until it
-// returns true; the slot's number, or the number of slots where it never did.
+// Calls visit(slot) for the slots in which a record may lie, one after the other, until it returns
+// true; the slot's number, or the number of slots where it never did.
 template <class Slots, class Visit>
-std::size_t probe(Slots& slots, std::string_view key, Visit visit) {
+std::size_t probe(Slots& slots, std::size_t hash, Visit visit) {
     const std::size_t mask = slots.size() - 1;
-    std::size_t at = KeyIndex::hashOf(key);
+    std::size_t at = hash;
     for (std::size_t i = 0; i < std::min(kWindow, slots.size()); ++i, ++at) {
         if (visit(slots[at & mask])) return at & mask;
     }
@@ -55,8 +55,9 @@ std::size_t KeyIndex::hashOf(std::string_view key) {
 }
 
 KeyIndex::Answer KeyIndex::find(std::string_view key) const {
-    const std::size_t at = probe(
-        _slots, key, [key](const char* slot) { return slot == nullptr || hasKey(slot, key); });
+    const std::size_t at = probe(_slots, hashOf(key), [key](const char* slot) {
+        return slot == nullptr || hasKey(slot, key);
+    });
     return at < _slots.size() ? Answer{_slots[at], true} : Answer{nullptr, _slots.empty()};
 }
 
@@ -69,9 +70,12 @@ void KeyIndex::reset(std::size_t records) {
     _used = 0;
 }
 
-void KeyIndex::insert(const char* record) {
-    const std::size_t at =
-        probe(_slots, RecordView(record).key(), [](const char* slot) { return slot == nullptr; });
+void KeyIndex::prefetch(std::size_t hash) const {
+    if (!_slots.empty()) __builtin_prefetch(&_slots[hash & (_slots.size() - 1)]);
+}
+
+void KeyIndex::insert(std::size_t hash, const char* record) {
+    const std::size_t at = probe(_slots, hash, [](const char* slot) { return slot == nullptr; });
     if (at == _slots.size()) return;
     _slots[at] = record;
     ++_used;
@@ -79,7 +83,7 @@ void KeyIndex::insert(const char* record) {
 
 const char** KeyIndex::slotOf(std::string_view key) {
     const std::size_t at =
-        probe(_slots, key, [key](const char* slot) { return hasKey(slot, key); });
+        probe(_slots, hashOf(key), [key](const char* slot) { return hasKey(slot, key); });
     return at < _slots.size() ? &_slots[at] : nullptr;
 }
 

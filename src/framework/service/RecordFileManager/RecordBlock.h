@@ -17,9 +17,10 @@ using Block = std::unique_ptr<char, FreeBlock>;
 // system untouched, so a damaged length costs address space, not memory.
 Block newBlock(std::size_t size);
 
-// A record in a block of its own, in the file's form. Its value has valueSize bytes: those that are
-// given, and zero bytes behind them. Null when there is no memory, as for a key whose length does
-// not fit into the file's 32 bits.
-Block newRecord(std::string_view key, std::uint32_t valueSize, std::string_view value);
+// A record in a block of its own, in the file's form. Null when there is no memory, as for a key or
+// a value whose length does not fit into the file's 32 bits.
+Block newRecord(std::string_view key, std::string_view value);
+// The same with a value that is longer than its bytes: zero bytes stand behind them.
+Block newRecord(std::string_view key, std::uint32_t valueSize, std::string_view valueBegin);
 
 }  // namespace korvex

@@ -69,7 +69,7 @@ void freeStoreLock() KORVEX_NO_THREAD_SAFETY_ANALYSIS {
     takenForFork = false;
 }
 
-KORVEX_SECOND_AT_START_UP void keepStoreLockThroughForks() {
+KORVEX_REGISTERS_STORE_LOCK void keepStoreLockThroughForks() {
     pthread_atfork(&takeStoreLock, &freeStoreLock, &freeStoreLock);
 }
 
@@ -101,13 +101,17 @@ void RecordFileManager::put(const std::string& key, const PersistentHashData& da
         storeLogger().error("Someone attempted to add internal version key to map - refusing.");
         return;
     }
-    Block block = newRecord(key, data._size, {static_cast<const char*>(data._pData), data._size});
+    enter(key, {static_cast<const char*>(data._pData), data._size});
+    if (writeToFile) saveToFile();
+}
+
+void RecordFileManager::enter(std::string_view key, std::string_view value) {
+    Block block = newRecord(key, value);
     if (!block) {
         throw ComponentException(storeLogger(),
                                  "Unable to allocate memory for storing hash value.");
     }
     _state->records.put(std::move(block));
-    if (writeToFile) saveToFile();
 }
 
 void RecordFileManager::get(const std::string& key, PersistentHashData& dataToReturn) const {

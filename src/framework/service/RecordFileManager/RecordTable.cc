@@ -15,6 +15,8 @@ const char* RecordTable::find(std::string_view key) const {
 
 const char* RecordTable::put(const char* record) {
     const std::string_view key = RecordView(record).key();
+    const std::size_t hash = KeyIndex::hashOf(key);
+    _index.prefetch(hash);
     const KeyOrder::Place place = _order.lowerBound(key);
     if (isAt(place, key)) {
         const char* const old = _order.at(place);
@@ -24,7 +26,7 @@ const char* RecordTable::put(const char* record) {
     }
     if (!_index.hasRoom()) enlargeIndex();
     _order.insert(place, record);
-    _index.insert(record);
+    _index.insert(hash, record);
     ++_size;
     return nullptr;
 }
@@ -32,7 +34,7 @@ const char* RecordTable::put(const char* record) {
 void RecordTable::enlargeIndex() {
     _index.reset(_size + 1);
     walk("", [this](RecordView record) {
-        _index.insert(record.begin());
+        _index.insert(KeyIndex::hashOf(record.key()), record.begin());
         return true;
     });
 }

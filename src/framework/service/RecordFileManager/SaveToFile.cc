@@ -1,6 +1,7 @@
 #include <korvex/framework/service/ComponentException.h>
 #include <korvex/framework/service/RecordFileManager.h>
 
+#include "base/ErrnoKeeper.h"
 #include "framework/service/RecordFileManager/RecordFormat.h"
 #include "framework/service/RecordFileManager/StagedFile.h"
 #include "framework/service/RecordFileManager/State.h"
@@ -10,6 +11,7 @@
 
 #include <cerrno>
 #include <limits>
+#include <optional>
 
 inline namespace korvex {
 
@@ -52,11 +54,6 @@ bool writeRecords(StagedFile& file, const RecordTable& table) {
     return written && write();
 }
 
-void reportFailedWrite() {
-    __extension__ storeLogger().error(
-        "Failed to write record, giving up on saving file.  Error is %d: %m.", errno);
-}
-
 }  // namespace
 
 // The key comes by value because that is the interface.
@@ -73,22 +70,32 @@ bool RecordFileManager::writeRecord(std::FILE* outFile, std::string key, unsigne
 }
 
 void RecordFileManager::saveToFile() {
+    save();
+}
+
+bool RecordFileManager::save() const {
     storeLogger().debug("Writing record file to disk.");
     if (_state->file.empty()) {
         throw ComponentException(storeLogger(), "Tried to write to db without setting filename.");
     }
-    umask(066);  // the records are nobody else's business; never set back
+    umask(066);                         // the records are nobody else's business; never set back
+    std::optional<ErrnoKeeper> keeper;  // of the failed call's, through the file's closing
     StagedFile file(_state->file);
     if (!file) {
+        keeper.emplace();
         __extension__ storeLogger().error(
             "Unable to open record file for writing at '%s'.  Cannot save hash data.  Error is "
             "%d: %m.",
             _state->file.c_str(), errno);
-        return;
+        return false;
     }
     // A full disk shows at the closing at the latest.
-    if (!writeVersion(file) || !writeRecords(file, _state->records.table()) || !file.close())
-        reportFailedWrite();
+    if (writeVersion(file) && writeRecords(file, _state->records.table()) && file.close())
+        return true;
+    keeper.emplace();
+    __extension__ storeLogger().error(
+        "Failed to write record, giving up on saving file.  Error is %d: %m.", errno);
+    return false;
 }
 
 }  // namespace korvex

@@ -1,0 +1,50 @@
+#pragma once
+
+#include <korvex/Export.h>
+#include <korvex/util/Logger/LogFormat.h>
+
+#include <string>
+#include <vector>
+
+inline namespace korvex {
+
+// A piece of a date: a pattern for strftime(3), or the milliseconds in three digits.
+struct DatePiece {
+    bool isMsec;
+    std::string pattern;
+};
+
+// A conversion of a layout, or the text between two.
+struct LayoutPiece {
+    enum What {
+        LITERAL,
+        MESSAGE,
+        CHANNEL,
+        LEVEL,
+        THREAD,
+        EPOCH_MSEC,
+        EPOCH_SEC,
+        PROCESSOR_TIME,
+        DATE,
+        OTHER  // what this class was not told of
+    };
+    static constexpr unsigned kUnlimited = ~0U;
+
+    What what;
+    std::string literal;
+    std::vector<DatePiece> date;
+    unsigned minWidth;
+    unsigned maxWidth;  // bytes; kUnlimited
+    char padding;       // fills up in front; 0: blanks behind
+};
+
+// A compiled layout laid open, for a tool that must know what its lines look like.
+class KORVEX_HIDDEN LayoutPieces {
+  public:
+    static std::vector<LayoutPiece> of(const LogFormat& layout);
+
+  private:
+    static std::vector<DatePiece> of(const LogFormattedDate& date);
+};
+
+}  // namespace korvex

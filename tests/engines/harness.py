@@ -1,0 +1,139 @@
+"""What the tests with real log engines share."""
+
+import collections
+import os
+import re
+import shutil
+import signal
+import socket
+import subprocess
+import tempfile
+import time
+import unittest
+
+BUILD = os.environ["KORVEX_BUILD"]  # a build directory with the tools and engine-writer
+ROOT = os.environ["KORVEX_ENGINES"]  # where the engines are unpacked; those installed will do, too
+SOURCE = os.path.dirname(os.path.dirname(os.path.dirname(os.path.abspath(__file__))))
+COUNT = int(os.environ.get("KORVEX_MESSAGES", "100000"))
+LOGCHECK = os.path.join(BUILD, "tools/korvex-logcheck/korvex-logcheck")
+WRITER = os.path.join(BUILD, "tests/engine-writer")
+
+LIBRARY = subprocess.run(["gcc", "-print-multiarch"], capture_output=True, text=True).stdout.strip()
+LIBRARIES = [os.path.join(ROOT, "usr/lib", LIBRARY), os.path.join(ROOT, "lib", LIBRARY),
+             os.path.join(ROOT, "usr/lib/syslog-ng")]
+PATH = os.pathsep.join([os.path.join(ROOT, "usr/sbin"), os.path.join(ROOT, "usr/bin"),
+                        "/usr/sbin", os.environ["PATH"]])
+
+Entry = collections.namedtuple("Entry", "level channel thread message")
+
+
+def program(name):
+    """The program's path; the test is skipped where there is none."""
+    path = shutil.which(name, path=PATH)
+    if path is None:
+        raise unittest.SkipTest("there is no %s" % name)
+    return path
+
+
+def environment(**more):
+    """For what is unpacked below ROOT."""
+    return dict(os.environ, PATH=PATH, LD_LIBRARY_PATH=os.pathsep.join(LIBRARIES), TZ="UTC",
+                LC_ALL="C.UTF-8", **more)
+
+
+def layouts():
+    with open(os.path.join(SOURCE, "tests/engines/layouts.txt")) as file:
+        return file.read().splitlines()
+
+
+def eventually(condition, what, seconds=120):
+    end = time.monotonic() + seconds
+    while not condition():
+        if time.monotonic() > end:
+            raise AssertionError("never came true: " + what)
+        time.sleep(0.1)
+
+
+def free_port():
+    with socket.socket() as one:
+        one.bind(("127.0.0.1", 0))
+        return one.getsockname()[1]
+
+
+def lines_of(path):
+    if not os.path.exists(path):
+        return []
+    with open(path, "rb") as file:
+        return file.read().splitlines()
+
+
+class EngineTest(unittest.TestCase):
+    """A directory of the test's own, and processes that end with it."""
+
+    def setUp(self):
+        self.directory = tempfile.mkdtemp(prefix="korvex-engines-")
+        self.addCleanup(shutil.rmtree, self.directory)
+        self.processes = []
+        self.addCleanup(self.end_all)
+
+    def file(self, *names):
+        return os.path.join(self.directory, *names)
+
+    def write(self, name, text):
+        with open(self.file(name), "w") as file:
+            file.write(text)
+        return self.file(name)
+
+    def start(self, command, **options):
+        with open(self.file(os.path.basename(command[0]) + ".err"), "ab") as errors:
+            process = subprocess.Popen(command, stdout=errors, stderr=errors,
+                                       stdin=subprocess.DEVNULL, **options)
+        self.processes.append(process)
+        return process
+
+    def stop(self, process, how=signal.SIGTERM):
+        process.send_signal(how)
+        process.wait(60)
+        self.processes.remove(process)
+
+    def end_all(self):
+        for process in list(self.processes):
+            self.stop(process, signal.SIGKILL)
+
+    def configure(self, layout, size=4000000, backups=20):
+        """A configuration with the appender LOG; its path."""
+        return self.write("log.cfg", "rootCategory=DEBUG,LOG\n"
+                          "appender.LOG.fileName=%s\n"
+                          "appender.LOG.maxFileSize=%d\n"
+                          "appender.LOG.maxBackupIndex=%d\n"
+                          "appender.LOG.layout.ConversionPattern=%s\n"
+                          % (self.file("app.log"), size, backups, layout))
+
+    def export(self, engine, source="log.cfg", options=()):
+        return subprocess.run([LOGCHECK, "--export", engine, self.file(source), *options],
+                              check=True, capture_output=True, text=True).stdout
+
+    def log(self, count=COUNT, pause=0):
+        """Logs that many messages of all shapes, with pauses; what an engine must find."""
+        out = subprocess.run([WRITER, self.file("log.cfg"), str(count), str(pause)], check=True,
+                             capture_output=True, env=environment()).stdout
+        entries = []
+        for line in out.decode().splitlines():
+            level, channel, thread, message = line.split("\t")
+            entries.append(Entry(level, channel, thread, bytes.fromhex(message)))
+        self.assertGreater(len(entries), count)
+        return entries
+
+    def shown(self, entries, layout):
+        """The entries as far as the layout shows them."""
+        has_channel = re.search(r"%[-.0-9]*c", layout)
+        has_thread = re.search(r"%[-.0-9]*t", layout)
+        return [Entry(entry.level[:2] if "%.2p" in layout else entry.level,
+                      has_channel and (entry.channel[:2] if "%.2c" in layout else entry.channel),
+                      has_thread and entry.thread, entry.message) for entry in entries]
+
+    def assert_same(self, found, expected):
+        """Compares lists too long for assertEqual's report."""
+        for number, (one, other) in enumerate(zip(found, expected)):
+            self.assertEqual(one, other, "entry %d" % number)
+        self.assertEqual(len(found), len(expected))

@@ -1,0 +1,78 @@
+"""lnav counts what was logged and gives it back, by the exported format definition."""
+
+import collections
+import csv
+import io
+import os
+import subprocess
+import unittest
+
+from harness import EngineTest, environment, layouts, program
+
+
+class LnavTest(EngineTest):
+    def setUp(self):
+        super().setUp()
+        self.lnav = program("lnav")
+
+    def install(self, layout):
+        self.configure(layout)
+        os.makedirs(self.file("config/formats/korvex"), exist_ok=True)
+        with open(self.file("config/formats/korvex/korvex.json"), "w") as file:
+            file.write(self.export("lnav"))
+
+    def run_lnav(self, *arguments):
+        return subprocess.run([self.lnav, "-I", self.file("config"), *arguments],
+                              capture_output=True, env=environment(HOME=self.directory))
+
+    def query(self, sql):
+        logs = [self.file(name) for name in os.listdir(self.directory) if name.startswith("app.log")]
+        self.assertGreater(len(logs), 1, "the log was not rotated")
+        result = self.run_lnav("-n", "-c", ";" + sql, "-c", ":write-csv-to -", *logs)
+        self.assertEqual(result.stderr, b"")
+        return list(csv.reader(io.StringIO(result.stdout.decode())))[1:]
+
+    def test_the_format_and_its_samples_are_accepted(self):
+        for layout in layouts():
+            with self.subTest(layout):
+                self.install(layout)
+                result = self.run_lnav("-C")
+                self.assertEqual((result.returncode, result.stderr.decode()), (0, ""))
+
+    def test_it_counts_each_level_and_channel_and_gives_messages_back(self):
+        for layout in layouts():
+            with self.subTest(layout):
+                self.remove_logs()
+                self.install(layout)
+                expected = self.shown(self.log(), layout)
+                self.check_counts(expected)
+                self.check_messages(expected)
+
+    def remove_logs(self):
+        for name in os.listdir(self.directory):
+            if name.startswith("app.log"):
+                os.remove(self.file(name))
+
+    def check_counts(self, expected):
+        channel = "channel" if expected[0].channel else "''"
+        found = self.query("SELECT level, %s, count(*) FROM korvex_log GROUP BY 1, 2" % channel)
+        counts = collections.Counter((one.level, one.channel or "") for one in expected)
+        self.assertEqual({(row[0], row[1]): int(row[2]) for row in found}, counts)
+
+    # Lines of one millisecond are in order within a file; of two files lnav may mix them.
+    def check_messages(self, expected):
+        thread = "thread" if expected[0].thread else "''"
+        rows = self.query("SELECT level, %s, hex(log_body), log_path FROM korvex_log "
+                          "ORDER BY log_line" % thread)
+        oldest_first = sorted(rows, key=lambda row: -backup_number(row[3]))
+        self.assert_same([(row[0], row[1], bytes.fromhex(row[2])) for row in oldest_first],
+                         [(one.level, one.thread or "", one.message) for one in expected])
+
+
+def backup_number(path):
+    end = path.rsplit(".", 1)[1]
+    return 0 if end == "log" else int(end)
+
+
+if __name__ == "__main__":
+    unittest.main()

@@ -1,0 +1,68 @@
+"""rsyslog follows a log that is rotated, and gives each message as a line of JSON."""
+
+import json
+import os
+import re
+import unittest
+
+from harness import (COUNT, ROOT, LIBRARY, EngineTest, Entry, environment, eventually, layouts,
+                     lines_of, program)
+
+MODULES = os.path.join(ROOT, "usr/lib", LIBRARY, "rsyslog")
+
+
+class RsyslogTest(EngineTest):
+    def setUp(self):
+        super().setUp()
+        self.rsyslogd = program("rsyslogd")
+
+    def config(self):
+        """The exported configuration, whose JSON goes into a file."""
+        text, replaced = re.subn(r'action\(type="omfwd".*?\)\n',
+                                 'action(type="omfile" file="%s" template="korvex_json")\n'
+                                 % self.file("out.json"), self.export("rsyslog"), flags=re.S)
+        self.assertEqual(replaced, 1)
+        os.makedirs(self.file("work"), exist_ok=True)
+        return self.write("rsyslog.conf", 'global(workDirectory="%s")\n' % self.file("work") + text)
+
+    def start_rsyslog(self):
+        modules = ["-M", MODULES] if os.path.isdir(MODULES) else []
+        return self.start([self.rsyslogd, "-n", "-f", self.config(), "-i", self.file("pid"),
+                           *modules], env=environment())
+
+    def entries(self):
+        found = []
+        for line in lines_of(self.file("out.json")):
+            one = json.loads(line.decode())
+            found.append(Entry(one["level"], one.get("channel"), one.get("thread"),
+                               one["message"].encode()))
+        return found
+
+    def clear(self):
+        for name in os.listdir(self.directory):
+            if name.startswith(("app.log", "out.json")):
+                os.remove(self.file(name))
+
+    def check(self, layout, size, pause=0):
+        self.clear()
+        self.configure(layout, size)
+        rsyslog = self.start_rsyslog()
+        eventually(lambda: os.path.exists(self.file("pid")), "rsyslogd's start")
+        expected = self.shown(self.log(COUNT // 10, pause), layout)
+        eventually(lambda: len(lines_of(self.file("out.json"))) >= len(expected),
+                   "all lines in the JSON", 60)
+        self.stop(rsyslog)
+        self.assert_same(self.entries(), expected)
+
+    def test_every_message_comes_as_json_in_order(self):
+        for layout in layouts():
+            with self.subTest(layout):
+                self.check(layout, size=0)
+
+    def test_a_log_that_is_rotated_every_few_seconds_is_followed(self):
+        self.check(layouts()[0], size=1000000, pause=3000)
+        self.assertTrue(os.path.exists(self.file("app.log.2")))
+
+
+if __name__ == "__main__":
+    unittest.main()

@@ -1,0 +1,232 @@
+#include <gmock/gmock.h>
+#include <korvex/util/Logger.h>
+
+#include <string>
+#include <vector>
+
+#include "tools/LogcheckTool.h"
+
+namespace {
+
+using testing::ElementsAre;
+using testing::IsEmpty;
+using testsupport::LogcheckToolTest;
+
+class LogcheckPatternsTest : public LogcheckToolTest {
+  protected:
+    // What is told of a pattern; the columns begin with it.
+    std::vector<std::string> told(const std::string& text) const {
+        std::vector<std::string> all = findings(pattern + text + '\n');
+        for (std::string& line : all) {
+            const std::size_t colon = line.find(':');
+            const std::size_t column = std::stoul(line.substr(colon + 1));
+            EXPECT_EQ(line.substr(0, colon), "3");
+            line = std::to_string(column - kBefore) + line.substr(line.find(':', colon + 1));
+        }
+        return all;
+    }
+    // The pattern that --fix makes of it.
+    std::string mended(const std::string& text) const {
+        const std::string out = fixed(pattern + text + '\n');
+        EXPECT_EQ(out.substr(0, pattern.size()), pattern);
+        return out.substr(pattern.size(), out.size() - pattern.size() - 1);
+    }
+
+    static constexpr std::size_t kBefore = 36;  // of its line
+};
+
+std::string nothing(const std::string& conversion) {
+    return "warning: there is no conversion \"" + conversion + "\": it prints nothing";
+}
+
+TEST_F(LogcheckPatternsTest, EveryConversionThatThereIsIsClean) {
+    EXPECT_THAT(told("%d %d{} %d{DATE} %d{ISO8601} %d{ABSOLUTE} %r %R %u %-5p %05r [%t] %.20c: "
+                     "100%% %% %%m %10.3m %.m{} %n"),
+                ElementsAre(testing::EndsWith("[pattern.argument]")));
+    EXPECT_THAT(told("\033[31m%p\033[0m %m%n"), IsEmpty());
+}
+
+TEST_F(LogcheckPatternsTest, ConversionsThatThereAreNot) {
+    const std::string place = "; a message does not know its file, line or method";
+    const std::string code = " [pattern.unknown]";
+    EXPECT_THAT(
+        told("%x%F%L%M%l%C{1}%X{u} %m%n"),
+        ElementsAre("1: " + nothing("%x") + "; there is no diagnostic context" + code,
+                    "3: " + nothing("%F") + place + code, "5: " + nothing("%L") + place + code,
+                    "7: " + nothing("%M") + place + code, "9: " + nothing("%l") + place + code,
+                    "11: " + nothing("%C{1}") + "; did you mean \"%c\"?" + code,
+                    "16: " + nothing("%X{u}") + "; there is no diagnostic context" + code));
+    EXPECT_THAT(told("%3%m%m%n"), ElementsAre("1: " + nothing("%3%") + code));
+    EXPECT_THAT(told("%- 5p%m%n"), ElementsAre("1: " + nothing("%- ") + code));
+    EXPECT_EQ(mended("%-5P %C %x%N %m%n"), "%-5p %C %x%n %m%n");
+}
+
+// The library and the tool know the same letters.
+TEST_F(LogcheckPatternsTest, TheLettersAreThoseOfTheLibrary) {
+    const Logger logger("channel");
+    const LogMsgMetadata md(&logger, WARN);
+    std::string all;
+    std::vector<std::string> expected;
+    for (char letter = 'A'; letter <= 'z'; ++letter) {
+        if (letter > 'Z' && letter < 'a') continue;
+        const std::string conversion = std::string("%") + letter;
+        std::string line;
+        LogFormat(conversion.c_str()).apply(line, md, "message");
+        if (line.empty()) expected.push_back(nothing(conversion));
+        all += conversion + ' ';
+    }
+    EXPECT_EQ(expected.size(), 52U - 9U);
+    std::vector<std::string> got;
+    for (const std::string& line : told(all + "%n")) {
+        const std::string text = line.substr(line.find(' ') + 1);
+        got.push_back(text.substr(0, text.find("nothing") + 7));
+    }
+    EXPECT_EQ(got, expected);
+}
+
+TEST_F(LogcheckPatternsTest, ConversionsSpeltOut) {
+    EXPECT_THAT(told("%message %-5level %class%n"),
+                ElementsAre("1: warning: %message is %m and the text \"essage\"; did you mean "
+                            "\"%m\"? [pattern.word]",
+                            "10: warning: %level is nothing and the text \"evel\"; did you mean "
+                            "\"%p\"? [pattern.word]",
+                            "19: warning: %class is %c and the text \"lass\" [pattern.word]"));
+    EXPECT_EQ(mended("%date{HH:mm:ss} [%thread] %-5level %logger{36} - %msg%newline"),
+              "%d{%H:%M:%S} [%t] %-5p %c - %m%n");
+    EXPECT_THAT(told("%cat %mat %nline %m%n"), IsEmpty());
+}
+
+TEST_F(LogcheckPatternsTest, AConversionThatThePatternsEndCuts) {
+    const std::string cut = "warning: the pattern ends within \"";
+    EXPECT_THAT(told("%m%n%"),
+                ElementsAre("5: " + cut + "%\", which prints nothing [pattern.cut]"));
+    EXPECT_THAT(told("%m%n%-5"),
+                ElementsAre("5: " + cut + "%-5\", which prints nothing [pattern.cut]"));
+    EXPECT_THAT(told("%m%n%d{ISO8601"),
+                ElementsAre("5: " + cut +
+                            "%d{ISO8601\", which prints nothing: there is no \"}\"; did you mean "
+                            "\"%d{ISO8601}\"? [pattern.cut]"));
+}
+
+TEST_F(LogcheckPatternsTest, AnArgumentWhereNoneCounts) {
+    EXPECT_THAT(told("%-5c{2} %m%n"),
+                ElementsAre("5: warning: \"{2}\" has no effect behind %c: only %d takes an "
+                            "argument; a width, as in %.20c, cuts the text; did you mean "
+                            "\"%-5c\"? [pattern.argument]"));
+    EXPECT_EQ(mended("%-5c{2} %m{}%n{x}"), "%-5c %m%n");
+}
+
+TEST_F(LogcheckPatternsTest, APatternWithoutItsMessage) {
+    EXPECT_THAT(told("%p %c%n"), ElementsAre("1: warning: without %m no line shows its message "
+                                             "[pattern.no-message]"));
+    EXPECT_THAT(told("%p %.0m %%m%n"), ElementsAre("1: warning: without %m no line shows its "
+                                                   "message [pattern.no-message]"));
+    EXPECT_THAT(told("%p %M%n"),
+                testing::Contains("1: warning: without %m no line shows its message; did you mean "
+                                  "\"%m\"? [pattern.no-message]"));
+}
+
+TEST_F(LogcheckPatternsTest, QuotationMarksAreNotToldAsAMissingNewlineToo) {
+    EXPECT_THAT(told("\"%m%n\""),
+                ElementsAre("1: warning: the quotation marks are printed with each line; did you "
+                            "mean \"%m%n\"? [pattern.quoted]"));
+    EXPECT_EQ(mended("\"'%p %m%n'\""), "%p %m%n");
+    EXPECT_THAT(told("\"%p\" %m%n"), IsEmpty());
+}
+
+TEST_F(LogcheckPatternsTest, BackslashesOfAProgrammingLanguage) {
+    EXPECT_THAT(told("%p\\t%m\\n"),
+                ElementsAre("3: warning: \\t is printed as it stands [pattern.backslash]",
+                            "7: warning: \\n is printed as it stands; a newline is %n; did you "
+                            "mean \"%n\"? [pattern.backslash]"));
+    EXPECT_EQ(mended("%p\\t%m%%\\r\\n"), "%p\t%m%%%n");
+    EXPECT_THAT(told("C:\\temp\\x %m%n"),
+                ElementsAre(testing::StartsWith("3: warning: \\t is printed")));
+}
+
+TEST_F(LogcheckPatternsTest, LinesThatDoNotEnd) {
+    EXPECT_THAT(findings(pattern + "%m\n"),
+                ElementsAre("3:12: warning: the layout of \"A\" does not end in %n: its lines run "
+                            "into each other [pattern.no-newline]"));
+}
+
+TEST_F(LogcheckPatternsTest, ALayoutThatAsksForTooMuch) {
+    EXPECT_THAT(findings(pattern + "%-4000000000m%n\n"),
+                ElementsAre("3:12: warning: the layout of \"A\" asks for a width of six digits "
+                            "[pattern.width]"));
+    EXPECT_THAT(findings(pattern + "%99999m 123456%n\n"), IsEmpty());
+}
+
+TEST_F(LogcheckPatternsTest, DatesInTheJavaForm) {
+    EXPECT_THAT(told("%d{HH:mm:ss,SSS} %d{h:mm a} %m%n"),
+                ElementsAre("4: warning: \"HH:mm:ss,SSS\" is printed as it stands: dates are "
+                            "written as strftime has them; did you mean \"%H:%M:%S,%l\"? "
+                            "[date.java]",
+                            "21: warning: \"h:mm a\" is printed as it stands: dates are written "
+                            "as strftime has them [date.java]"));
+    EXPECT_EQ(mended("%d{yyyy-MM-dd} %m%n"), "%d{%Y-%m-%d} %m%n");
+    EXPECT_EQ(mended("%d{yyyy-MM-dd'T'HH:mm:ss.SSSZ} %d{dd MMM yyyy} %d{yyyyMMddTHHmmss} %m%n"),
+              "%d{%Y-%m-%dT%H:%M:%S.%l%z} %d{%d %b %Y} %d{%Y%m%dT%H%M%S} %m%n");
+    EXPECT_EQ(mended("%d{EEE, d MMMM yy hh:mm:ss a 'o''clock'} %m%n"),
+              "%d{%a, %e %B %y %I:%M:%S %p o'clock} %m%n");
+    EXPECT_EQ(mended("%d{HH:MM} %m%n"), "%d{%H:%M} %m%n");
+    EXPECT_EQ(mended("%d{HH:mm:ss.SSSSSS} %m%n"), "%d{HH:mm:ss.SSSSSS} %m%n");
+}
+
+TEST_F(LogcheckPatternsTest, NamedLayoutsMisspelt) {
+    EXPECT_THAT(told("%d{iso8601} %m%n"),
+                ElementsAre("4: warning: \"iso8601\" is no named layout, and is printed as it "
+                            "stands; they are ISO8601, DATE and ABSOLUTE; did you mean "
+                            "\"ISO8601\"? [date.name]"));
+    EXPECT_EQ(mended("%d{date} %d{Absolut} %d{ISO-8601} %d{ISO_8601} %d{ISO8061} %m%n"),
+              "%d{DATE} %d{ABSOLUTE} %d{ISO8601} %d{ISO8601} %d{ISO8601} %m%n");
+}
+
+TEST_F(LogcheckPatternsTest, ADateWithoutAConversion) {
+    EXPECT_THAT(told("%d{today} %m%n"), ElementsAre("4: warning: \"today\" has no conversion: each "
+                                                    "line shows it as it stands [date.text]"));
+    EXPECT_EQ(mended("%d{today} %m%n"), "%d{today} %m%n");
+}
+
+TEST_F(LogcheckPatternsTest, ConversionsThatStrftimeDoesNotKnow) {
+    EXPECT_THAT(told("%d{%H:%i.%f} %d{%H%} %d{%-E%l} %m%n"),
+                ElementsAre("7: warning: strftime knows no \"%i\" [date.unknown]",
+                            "10: warning: strftime knows no \"%f\"; the milliseconds are %l; did "
+                            "you mean \"%l\"? [date.unknown]",
+                            "19: warning: \"%\" is cut short, and printed as it stands "
+                            "[date.unknown]",
+                            "25: warning: \"%-E\" is cut short, and printed as it stands "
+                            "[date.unknown]"));
+    EXPECT_EQ(mended("%d{%H:%M:%S.%f} %d{%S,%3N} %d{%S.%Q} %m%n"),
+              "%d{%H:%M:%S.%l} %d{%S,%l} %d{%S.%l} %m%n");
+    EXPECT_THAT(told("%d{%a%A%b%B%c%C%d%D%e%F%g%G%h%H%I%j%k%m%n%M%p%P%r%R%s%S%t%T%u%U%V%w%W%x%X"
+                     "%y%Y%z%Z%%%-d%_5H%^a%^Z%010Y%+4Y%Ey%Od%l} %m%n"),
+                IsEmpty());
+}
+
+TEST_F(LogcheckPatternsTest, MonthsWhereMinutesAreMeant) {
+    EXPECT_THAT(told("%d{%Y-%M-%d %H:%m} %m%n"),
+                ElementsAre("4: warning: \"%Y-%M\" shows minutes there; did you mean \"%Y-%m\"? "
+                            "[date.minutes]",
+                            "13: warning: \"%H:%m\" shows the month there; did you mean "
+                            "\"%H:%M\"? [date.minutes]"));
+    EXPECT_EQ(mended("%d{%Y-%M-%d %H:%m} %d{%d.%M.%Y} %d{%I:%m} %m%n"),
+              "%d{%Y-%m-%d %H:%M} %d{%d.%m.%Y} %d{%I:%M} %m%n");
+}
+
+TEST_F(LogcheckPatternsTest, MillisecondsThatAreNone) {
+    EXPECT_THAT(told("%d{%S.%3l} %d{%%l} %m%n"),
+                ElementsAre("7: warning: \"%3l\" is the hour; only %l, without anything between, "
+                            "is the milliseconds [date.milliseconds]",
+                            "15: warning: \"%%l\" is a percent sign and the milliseconds: %l is "
+                            "looked for first [date.milliseconds]"));
+}
+
+TEST_F(LogcheckPatternsTest, ThePatternThatCountsIsTheLast) {
+    EXPECT_THAT(codes(pattern + "%x%m%n\nappender.A.layout.ConversionPattern=%m%n\n"),
+                ElementsAre("attribute.repeated"));
+    EXPECT_THAT(codes("appender.rootAppender.layout.ConversionPattern=%x %m%n\n"),
+                ElementsAre("pattern.unknown"));
+}
+
+}  // namespace

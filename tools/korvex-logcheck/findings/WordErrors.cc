@@ -1,0 +1,92 @@
+#include <algorithm>
+
+#include "Text.h"
+#include "findings/Findings.h"
+#include "findings/Levels.h"
+#include "findings/NearMiss.h"
+
+namespace {
+
+// What a word of a value, which is neither a level nor an appender, was meant to be.
+struct Slip {
+    Code code;
+    std::string reason;
+    std::string meant;
+    bool sure;
+};
+
+bool isKnown(const Configuration& config, const std::string& word) {
+    return isLevel(word) || config.hasAppender(word);
+}
+
+std::string nearest(const Configuration& config, const std::string& word) {
+    const std::string low = lowered(word);
+    if (low == "stderr" || low == "console" || low == "stdout") return "rootAppender";
+    std::vector<std::string> names = levelNames();
+    for (const Appender* const appender : config.everyAppender())
+        names.push_back(appender->name);
+    return nearestTo(word, names);
+}
+
+Slip slipOf(const Configuration& config, const std::string& word) {
+    if (word.back() == '#') {
+        const std::string before = word.substr(0, word.size() - 1);
+        return {Code::WORD_HASH, "; a \"#\" right behind a word belongs to it", before, true};
+    }
+    const std::string bare(withoutQuotes(word));
+    const std::string reason = bare == word ? "" : "; quotation marks belong to a word";
+    const std::string inUpperCase = levelInOtherCase(bare);
+    if (!inUpperCase.empty()) {
+        return {Code::LEVEL_CASE, "; levels are in upper case" + reason, inUpperCase, true};
+    }
+    const std::string level = levelOfOtherName(bare);
+    if (!level.empty()) {
+        return {Code::LEVEL_OTHER_NAME, "; the level is called so elsewhere" + reason, level, true};
+    }
+    const std::string meant = isKnown(config, bare) ? bare : nearest(config, bare);
+    return {Code::WORD_UNKNOWN, reason, meant, false};
+}
+
+// A value that names no appender that exists keeps the root's, or standard error.
+std::string consequence(const Reading& reading, const ConfigStatement& said) {
+    for (const std::string& word : wordsOf(said.value)) {
+        if (!isLevel(word) && reading.config.hasAppender(word)) return "";
+    }
+    const bool root = said.kind == ConfigStatement::ROOT;
+    std::vector<std::string> names;
+    const LogChannel& channel =
+        root ? *reading.config.root.made : *LogChannel::find(said.name, false);
+    for (const LogAppender* const one : Configuration::destinations(channel))
+        names.push_back(visible(reading.config.nameOf(one)));
+    return std::string("; ") + (root ? "the root" : "the category") +
+           " names no appender that exists, so it writes to " + listed(names);
+}
+
+void checkValue(const Reading& reading, const ConfigStatement& said, Findings& to) {
+    const Piece value = valueOf(reading.source, said);
+    std::size_t from = 0;
+    for (const std::string& word : wordsOf(said.value)) {
+        from = said.value.find(word, from);
+        const Piece piece = value.part(from, word.size());
+        from += word.size();
+        if (isKnown(reading.config, word)) continue;
+        const Slip slip = slipOf(reading.config, word);
+        std::vector<Edit> edits;
+        if (slip.sure) {
+            edits = piece.replacedBy(slip.code == Code::WORD_HASH ? slip.meant + " #" : slip.meant);
+        }
+        const bool level = slip.code == Code::LEVEL_CASE || slip.code == Code::LEVEL_OTHER_NAME;
+        tell(to, slip.code, piece.place(),
+             parseError(reading, said.lineno) + quoted(word) +
+                 " is neither a level nor an appender" + slip.reason +
+                 (level ? "" : consequence(reading, said)),
+             slip.meant, std::move(edits));
+    }
+}
+
+}  // namespace
+
+void findInWords(const Reading& reading, Findings& to) {
+    for (const ConfigStatement* const said : reading.config.appliedValues())
+        checkValue(reading, *said, to);
+}
