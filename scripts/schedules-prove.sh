@@ -4,7 +4,7 @@
 set -eu
 cd "$(dirname "$0")/.."
 [ $# -gt 0 ] || set -- tests/schedules/mutants/*.patch
-work=$PWD/build/schedules-prove
+work=${KORVEX_BUILD_DIR:-$PWD/build}/schedules-prove
 tree=$work/tree
 mkdir -p "$tree"
 

@@ -116,7 +116,7 @@ rm bin/apt-get bin/dpkg-query
 dev 1 build
 says "missing: g++"
 says "There is no apt-get here"
-for program in g++ ninja abidw locale getfacl getfattr clang-format logrotate gzip mandoc zsh patch; do
+for program in g++ ninja abidw clang-format locale-gen logrotate gzip mandoc zsh patch setfacl; do
     : | stand_in "$program"
 done
 : | stand_in pkg-config

@@ -3,6 +3,7 @@
 #include <gmock/gmock.h>
 
 #include <algorithm>
+#include <set>
 #include <string>
 #include <vector>
 
@@ -104,6 +105,18 @@ TEST(CrashStates, TwoWritesToTwoBlocksArriveInAnyOrder) {
                 UnorderedElementsAre("a=........!", "a=1.......!", "a=....2...!", "a=1...2...!"));
 }
 
+TEST(CrashStates, AWriteInTheMiddleDoesNotShortenTheFile) {
+    const History history{directory("a", "............"), {Write{kOld, 0, "abcdefgh"}}};
+    EXPECT_THAT(statesOf(history), UnorderedElementsAre("a=............!", "a=abcd........!",
+                                                        "a=....efgh....!", "a=abcdefgh....!"));
+}
+
+TEST(CrashStates, WhatWasCutOffBeforeASyncDoesNotComeBack) {
+    const History history{directory("a", "old"),
+                          {Truncate{kOld, 0}, SyncFile{kOld, true}, Truncate{kOld, 3}}};
+    EXPECT_THAT(statesOf(history), UnorderedElementsAre("a=old", "a=000!", "a=!"));
+}
+
 TEST(CrashStates, ATruncationMayComeWithoutTheDataAndTheDataWithoutIt) {
     const History history{directory("a", "old"), {Truncate{kOld, 0}, Write{kOld, 0, "n"}}};
     EXPECT_THAT(statesOf(history),
@@ -141,12 +154,22 @@ TEST(CrashStates, AFileMayHaveTwoNamesUntilOneIsGone) {
     EXPECT_THAT(statesOf(history), UnorderedElementsAre("", "t=!", "a= t=a!", "a=!"));
 }
 
+TEST(CrashStates, ARenameBetweenTwoNamesOfOneFileDoesNothing) {
+    const History history{directory("a", "x"), {Link{kOld, "b"}, Rename{"a", "b"}}};
+    EXPECT_THAT(statesOf(history), UnorderedElementsAre("a=x!", "a=x b=a!"));
+}
+
 TEST(CrashStates, TwoEqualFilesAreNotOneFile) {
     const History linked{directory("a", "x"), {Link{kOld, "b"}, SyncDirectory{}}};
     const History copied{
         directory("a", "x"),
         {Create{"b", kNew, {}}, SyncDirectory{}, Write{kNew, 0, "x"}, SyncFile{kNew, true}}};
+    const History both{directory("a", "x"),
+                       {Create{"b", kNew, {}}, Write{kNew, 0, "x"}, SyncFile{kNew, true},
+                        SyncDirectory{}, Unlink{"b"}, Link{kOld, "b"}}};
     EXPECT_THAT(statesOf(linked), UnorderedElementsAre("a=x", "a=x b=a!"));
+    EXPECT_THAT(statesOf(both),
+                UnorderedElementsAre("a=x!", "a=x b=", "a=x b=0", "a=x b=x!", "a=x b=a!"));
     EXPECT_THAT(statesOf(copied), UnorderedElementsAre("a=x", "a=x b=", "a=x b=0", "a=x b=x!"));
 }
 
@@ -162,9 +185,8 @@ TEST(CrashStates, ChangesOfDifferentNamesArriveInAnyOrder) {
 }
 
 TEST(CrashStates, ChangesOfDifferentNamesMayKeepTheirOrder) {
-    const History history{{}, {Create{"a", 1, {}}, Create{"b", 2, {}}, Unlink{"a"}}};
-    EXPECT_THAT(statesOf(history, NameOrder::OF_ALL),
-                UnorderedElementsAre("!", "a=!", "a= b=!", "b=!"));
+    const History history{{}, {Create{"a", 1, {}}, Create{"b", 2, {}}}};
+    EXPECT_THAT(statesOf(history, NameOrder::OF_ALL), UnorderedElementsAre("!", "a=!", "a= b=!"));
 }
 
 TEST(CrashStates, ChangesOfOneNameOrOneFileKeepTheirOrder) {
@@ -190,6 +212,11 @@ TEST(CrashStates, AnAttributeMayBeRemoved) {
     EXPECT_THAT(statesOf(history), UnorderedElementsAre("a=,x:1!", "a=!"));
 }
 
+TEST(CrashStates, AnAttributeMayBeAdded) {
+    const History history{directory("a", ""), {SetAttribute{kOld, "x", "1"}}};
+    EXPECT_THAT(statesOf(history), UnorderedElementsAre("a=!", "a=,x:1!"));
+}
+
 TEST(CrashStates, WhatProgramsSeeIsNeverLeftOut) {
     std::vector<Event> events{Create{"a", kNew, {}}};
     for (unsigned i = 0; i < 30; ++i)
@@ -202,6 +229,37 @@ TEST(CrashStates, WhatProgramsSeeIsNeverLeftOut) {
                *state.names.at("a").file == states.visible().files.at(kNew);
     };
     EXPECT_TRUE(std::any_of(states.all().begin(), states.all().end(), isIt));
+}
+
+TEST(CrashStates, MoreBlocksOfAFileThanTheBoundAreNotAllCombined) {
+    FileModel model({std::string(20, '.'), {}}, 4);
+    model.write(0, std::string(20, 'x'));
+    bool complete = true;
+    EXPECT_THAT(model.variants(32, complete), SizeIs(32));
+    EXPECT_TRUE(complete);
+    const std::vector<File> some = model.variants(31, complete);
+    EXPECT_FALSE(complete);
+    EXPECT_EQ(some.back().bytes, std::string(20, 'x'));
+    EXPECT_THAT(std::set<File>(some.begin(), some.end()), SizeIs(some.size()));
+}
+
+TEST(CrashStates, AFilesVariantsAreEachThereOnce) {
+    FileModel model({"", {}}, 4);
+    model.write(0, "a");
+    model.truncate(0);
+    model.write(0, "a");
+    bool complete = true;
+    std::vector<std::string> texts;
+    for (const File& file : model.variants(100, complete))
+        texts.push_back(file.bytes);
+    EXPECT_THAT(texts, ElementsAre("", std::string(1, '\0'), "a"));
+}
+
+TEST(CrashStates, MoreFilesThanTheBoundAreNotAllCombined) {
+    const History history{{{{"a", 1}, {"b", 2}}, {{1, {"........", {}}}, {2, {"........", {}}}}},
+                          {Write{1, 0, "xxxxxxxx"}, Write{2, 0, "xxxxxxxx"}}};
+    EXPECT_TRUE(CrashStates(history, {4, 16, NameOrder::OF_EACH}).complete());
+    EXPECT_FALSE(CrashStates(history, {4, 15, NameOrder::OF_EACH}).complete());
 }
 
 TEST(CrashStates, MoreChangesOfNamesThanTheBoundAreNotAllCombined) {

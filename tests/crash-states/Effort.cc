@@ -13,8 +13,9 @@ bool isThorough() {
 
 void printStates(const std::string& subject, const History& history, const CrashStates& states,
                  const std::string& result) {
-    std::printf("[  states ] %s | %zu | %zu%s | %s\n", subject.c_str(), history.events.size(),
-                states.all().size(), states.complete() ? "" : ", bounded", result.c_str());
+    std::printf("[  states ] %s | %zu | %zu | %s%s\n", subject.c_str(), history.events.size(),
+                states.all().size(), result.c_str(),
+                states.complete() ? "" : " (not all: bounded)");
 }
 
 }  // namespace crashstates

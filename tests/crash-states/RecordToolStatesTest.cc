@@ -29,8 +29,6 @@ using testing::Not;
 using testsupport::ChildResult;
 using testsupport::fileOf;
 
-using Records = std::vector<std::pair<std::string, std::string>>;
-
 const std::string kValue(80, 'v');
 const std::string kDump = "VERSION=3\nHEADER=END\n 62\n " + [] {
     std::string digits;
@@ -48,7 +46,7 @@ struct Verb {
     bool isThere;        // the record file is
     std::string target;  // the file that it writes
     int status;
-    std::size_t blockSize = 64;  // a third of it where all is asked for
+    std::size_t blockSize = 64;  // bytes; half of it where all is asked for
 
     friend void PrintTo(const Verb& verb, std::ostream* out) { *out << verb.name; }
 };
@@ -98,7 +96,7 @@ class RecordToolStates : public testsupport::RecordsToolTest,
     }
     static const Verb& verb() { return GetParam(); }
     Bounds bounds() const {
-        return {verb().blockSize / (isThorough() ? 3 : 1), 1U << 14, NameOrder::OF_EACH};
+        return {verb().blockSize / (isThorough() ? 2 : 1), 1U << 14, NameOrder::OF_EACH};
     }
 
     // The directory as it was, its file with a mode and an attribute that a new one has not.

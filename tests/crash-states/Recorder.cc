@@ -263,6 +263,11 @@ void Recorder::addAttributeHandlers(std::map<long, Handler>& all) {
     for (const long call : {SYS_chmod, SYS_chown, SYS_lchown})
         all[call] = byPath;
 #endif
+#ifdef SYS_chown32
+    for (const long call : {SYS_chown32, SYS_lchown32})
+        all[call] = byPath;
+    all[SYS_fchown32] = byDescriptor;
+#endif
     for (const long call : {SYS_fchmodat, SYS_fchownat})
         all[call] = byPathAt;
 }

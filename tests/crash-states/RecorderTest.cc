@@ -198,6 +198,12 @@ TEST_F(RecorderTest, WhatCannotBeRecordedIsTold) {
     const TempDir other;
     EXPECT_THROW(recordBody([&] { std::rename(file("a").c_str(), other.file("a").c_str()); }),
                  std::runtime_error);
+    testsupport::writeFile(file("a"), "x");
+    EXPECT_THROW(recordBody([&] {
+                     std::rename(file("a").c_str(), other.file("a").c_str());
+                     std::rename(other.file("a").c_str(), file("b").c_str());
+                 }),
+                 std::runtime_error);
     EXPECT_THROW(recordBody([&] { mkdir(file("sub").c_str(), 0700); }), std::runtime_error);
 }
 

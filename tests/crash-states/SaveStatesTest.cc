@@ -58,6 +58,9 @@ class SaveStates : public testing::Test {
     // may seem to have gigabytes.
     ChildResult readAfterwards(const State& state) const {
         makeDirectory(state, _dir.path());
+#ifdef __SANITIZE_THREAD__  // whose calloc touches all that it gives, and these are gigabytes
+        return {0, 0, "", "not tried"};
+#endif
         return testsupport::runInChild([&] {
             storesteps::store().setDBFile(Pathname(_data));
             try {
@@ -119,7 +122,9 @@ TEST_F(SaveStates, AreOfOldBlocksNewOnesAndZerosAndEachCanBeRead) {
     }
     for (const char* kind : {"the old", "the new", "empty", "a beginning", "zeros", "a mixture"})
         EXPECT_THAT(kinds, Contains(Key(kind))) << "the promise says too little";
+#ifndef __SANITIZE_THREAD__
     EXPECT_THAT(untold, Gt(0U));
+#endif
     printStates("library, put and save", history, states,
                 "old or new or zeros, block by block; " + std::to_string(untold) +
                     " losses that reading does not tell");

@@ -86,13 +86,13 @@ class Tracer {
             fail("cannot be looked at");
         }
         if (info.op == PTRACE_SYSCALL_INFO_ENTRY) {
-            SystemCall& call = _under_way[who];
+            SystemCall& call = _underWay[who];
             call.process = who;
             call.number = static_cast<long>(info.entry.nr);
             std::copy(info.entry.args, info.entry.args + 6, call.arguments);
-        } else if (info.op == PTRACE_SYSCALL_INFO_EXIT && _under_way.count(who) > 0) {
-            SystemCall call = _under_way[who];
-            _under_way.erase(who);
+        } else if (info.op == PTRACE_SYSCALL_INFO_EXIT && _underWay.count(who) > 0) {
+            SystemCall call = _underWay[who];
+            _underWay.erase(who);
             call.result = info.exit.rval;
             if (!info.exit.is_error) _seen(call);
         }
@@ -100,7 +100,7 @@ class Tracer {
 
     const pid_t _child;
     const std::function<void(const SystemCall&)>& _seen;
-    std::map<pid_t, SystemCall> _under_way;
+    std::map<pid_t, SystemCall> _underWay;
 };
 
 }  // namespace

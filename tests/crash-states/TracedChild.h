@@ -3,7 +3,6 @@
 #include <sys/types.h>
 
 #include <functional>
-#include <optional>
 #include <string>
 
 namespace crashstates {

@@ -132,6 +132,19 @@ class EngineTest(unittest.TestCase):
                       has_channel and (entry.channel[:2] if "%.2c" in layout else entry.channel),
                       has_thread and entry.thread, entry.message) for entry in entries]
 
+    def last_of_backups(self):
+        """The numbers of the messages that are the last of a file that was rotated away, of the first
+        of the layouts."""
+        begin = re.compile(rb"^[0-9-]{10} [0-9:]{8},[0-9]{3} \[[A-Za-z0-9 -]+\] [A-Z?]+ +[a-z.1-]+: ")
+        backups = [name for name in os.listdir(self.directory) if name.startswith("app.log.")]
+        numbers = []
+        count = 0
+        for name in sorted(backups, key=lambda one: -int(one.rsplit(".", 1)[1])):
+            with open(self.file(name), "rb") as file:
+                count += sum(1 for line in file.read().split(b"\n") if begin.match(line))
+            numbers.append(count - 1)
+        return numbers
+
     def assert_same(self, found, expected):
         """Compares lists too long for assertEqual's report."""
         for number, (one, other) in enumerate(zip(found, expected)):

@@ -12,8 +12,8 @@
 #include "strategies/Course.h"
 #include "strategies/Priorities.h"
 
-// Explores the orders in which threads can go on. Prints a line a scenario: how many schedules had 0,
-// 1, 2 ... preemptions, a "+" where there are more of them, and how many were drawn.
+// Explores the orders in which threads can go on. Prints a line a scenario: how many schedules had
+// 0, 1, 2 ... preemptions, a "+" where there are more of them, and how many were drawn.
 
 namespace schedules {
 
@@ -93,7 +93,8 @@ bool Exploration::exploreBounded() {
         const Bounded::Result result = bounded.explore(n, _options.limit);
         if (!result.failure.empty()) {
             std::printf(" %u:%lu", n, result.schedules + 1);
-            return tellFailure(result.failure, n >= _scenario.wantedFrom, "--replay '" + toText(result.schedule) + "'");
+            return tellFailure(result.failure, n >= _scenario.wantedFrom,
+                               "--replay '" + toText(result.schedule) + "'");
         }
         std::printf(" %u:%lu%s", n, result.schedules, result.complete ? "" : "+");
         std::fflush(stdout);
@@ -122,8 +123,9 @@ bool Exploration::exploreRandom() {
         const std::string failure = _runner.run(_scenario, priorities);
         if (failure.empty()) continue;
         std::printf(" random:%lu", n + 1);
-        return tellFailure(failure, true, "--only-seed " + std::to_string(_options.seed + n) +
-                                        " --depth " + std::to_string(_options.depth));
+        return tellFailure(failure, true,
+                           "--only-seed " + std::to_string(_options.seed + n) + " --depth " +
+                               std::to_string(_options.depth));
     }
     std::printf(" random:%lu", _options.random);
     return true;
@@ -208,9 +210,8 @@ bool isWanted(const Options& options, const Scenario& scenario) {
 
 int exploreAll(const Options& options) {
     Runner runner;
-    std::sort(scenarios().begin(), scenarios().end(), [](const Scenario& a, const Scenario& b) {
-        return std::strcmp(a.name, b.name) < 0;
-    });
+    std::sort(scenarios().begin(), scenarios().end(),
+              [](const Scenario& a, const Scenario& b) { return std::strcmp(a.name, b.name) < 0; });
     unsigned tried = 0;
     unsigned number = 0;
     bool well = true;

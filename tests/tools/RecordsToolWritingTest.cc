@@ -246,9 +246,13 @@ TEST_F(WritingTest, AFileOfAnotherVersionIsRefusedUnlessItIsMeant) {
     writeFile(data, other);
     EXPECT_EQ(run({"get", "a"}).out, "1");
     expectRefused({"put", "b", "2"}, data +
-                                         ": its version is \"3.0\", not \"2.0\"; not written to "
+                                         ": its version is \"3.0\", not \"2.0\"; not written "
                                          "without --any-version");
     EXPECT_EQ(stored(), other);
+    EXPECT_EQ(run({"salvage", "-o", dir.file("new")}).status, 4);
+    EXPECT_FALSE(std::filesystem::exists(dir.file("new")));
+    EXPECT_EQ(run({"salvage", "--any-version", "-o", dir.file("new")}).status, 0);
+    EXPECT_EQ(readFile(dir.file("new")), before);
     EXPECT_EQ(run({"--any-version", "put", "b", "2"}).status, 0);
     EXPECT_EQ(stored(), after);
     writeFile(data, recordBytes("a", "1"));

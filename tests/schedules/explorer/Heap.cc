@@ -31,9 +31,8 @@ std::size_t pageNumber(const void* address) {
 }  // namespace
 
 void Heap::reserve() {
-    void* const pages = mmap(nullptr, kMaxThreads * kPagesPerThread * kPage,
-                             PROT_READ | PROT_WRITE, MAP_PRIVATE | MAP_ANONYMOUS | MAP_NORESERVE,
-                             -1, 0);
+    void* const pages = mmap(nullptr, kMaxThreads * kPagesPerThread * kPage, PROT_READ | PROT_WRITE,
+                             MAP_PRIVATE | MAP_ANONYMOUS | MAP_NORESERVE, -1, 0);
     if (pages == MAP_FAILED) {
         std::perror("mmap");
         std::exit(2);

@@ -77,10 +77,9 @@ void expectBefore(const Access (&accesses)[kMaxThreads], std::uint8_t bytes, con
         const Access& access = accesses[other];
         if (other == me || (access.bytes & bytes) == 0) continue;
         if (access.time <= threadClock[me].of[other]) continue;
-        Scheduler::instance().failAt(caller, reinterpret_cast<const void*>(
-                                                 static_cast<std::uintptr_t>(access.caller)),
-                                     "data race: thread %u %s what thread %u %s", me, what, other,
-                                     earlier);
+        Scheduler::instance().failAt(
+            caller, reinterpret_cast<const void*>(static_cast<std::uintptr_t>(access.caller)),
+            "data race: thread %u %s what thread %u %s", me, what, other, earlier);
     }
 }
 
@@ -153,7 +152,8 @@ void Races::access(const void* address, std::size_t size, bool writes, const voi
 void Races::freed(const void* address, std::size_t size, const void* caller) {
     if (!active()) return;
     const std::uintptr_t first = reinterpret_cast<std::uintptr_t>(address) / 8;
-    for (std::uintptr_t word = first; word < first + std::min<std::size_t>(size, 4096) / 8; ++word) {
+    for (std::uintptr_t word = first; word < first + std::min<std::size_t>(size, 4096) / 8;
+         ++word) {
         Cell* const cell = cellOf(word, false);
         if (cell == nullptr) continue;
         expectBefore(cell->write, 0xff, "frees", "has written", caller);

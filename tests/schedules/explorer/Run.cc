@@ -45,8 +45,8 @@ void catchBadAccesses() {
 Runner::Runner()
     : _dir((access("/dev/shm", W_OK) == 0 ? "/dev/shm" : "/tmp") +
            std::string("/korvex-schedules-XXXXXX")) {
-    void* const memory = mmap(nullptr, sizeof(Board), PROT_READ | PROT_WRITE,
-                              MAP_SHARED | MAP_ANONYMOUS, -1, 0);
+    void* const memory =
+        mmap(nullptr, sizeof(Board), PROT_READ | PROT_WRITE, MAP_SHARED | MAP_ANONYMOUS, -1, 0);
     if (memory == MAP_FAILED || mkdtemp(_dir.data()) == nullptr) {
         std::perror("schedules");
         std::_Exit(2);

@@ -134,7 +134,7 @@ unsigned Scheduler::choose(ThreadState& self, bool matters) {
     if (choice.ready != bit(self.number) || choice.couldTimeOut != 0 || choice.couldWake != 0)
         chosen = _strategy->choose(choice);
     ThreadState& next = _threads[chosen];
-    next.turn = (choice.ready & bit(chosen)) != 0            ? Turn::READY
+    next.turn = (choice.ready & bit(chosen)) != 0          ? Turn::READY
                 : (choice.couldTimeOut & bit(chosen)) != 0 ? Turn::TIMED_OUT
                                                            : Turn::WOKEN;
     const bool matteredAtAll = !choice.currentCouldGoOn || matters;

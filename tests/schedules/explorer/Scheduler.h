@@ -119,8 +119,7 @@ class Scheduler {
     void tellShared(const void* object);
     bool isShared(const void* object) const;
     [[noreturn]] void failForDeadlock();
-    [[noreturn]] void endFailed(const char* fmt, va_list ap)
-        __attribute__((format(printf, 2, 0)));
+    [[noreturn]] void endFailed(const char* fmt, va_list ap) __attribute__((format(printf, 2, 0)));
 
     Board* _board = nullptr;
     Strategy* _strategy = nullptr;

@@ -12,8 +12,8 @@ namespace schedules {
 
 namespace {
 
-// The function and the line of the innermost code at each step's call. (All by one command, which has
-// much to read.)
+// The function and the line of the innermost code at each step's call. (All by one command, which
+// has much to read.)
 std::map<const void*, std::string> placesOf(const Board& board, unsigned from) {
     std::map<const void*, std::string> places;
     for (unsigned i = from; i < board.steps; ++i) {

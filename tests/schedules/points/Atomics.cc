@@ -102,39 +102,46 @@ bool exchangeIf(volatile T* object, T* expected, T value, int order, const void*
 }  // namespace schedules
 
 #define CALLER SCHEDULES_CALLER
-#define FETCH(bits, type, name, expression)                                                       \
-    extern "C" type __tsan_atomic##bits##_##name(volatile type* object, type operand, int order); \
-    extern "C" type __tsan_atomic##bits##_##name(volatile type* object, type operand,             \
-                                                 int order) {                                     \
-        return schedules::change(                                                                 \
-            object, [operand](type old) { return static_cast<type>(expression); }, order,         \
-            CALLER);                                                                              \
+#define FETCH(bits, type, name, expression)                                                        \
+    extern "C" type __tsan_atomic##bits##_##name(volatile type* object, type operand, int order);  \
+    extern "C" type __tsan_atomic##bits##_##name(volatile type* object, type operand, int order) { \
+        return schedules::change(                                                                  \
+            object, [operand](type old) { return static_cast<type>(expression); }, order, CALLER); \
     }
-#define EXCHANGE_IF(bits, type, name)                                                     \
-    extern "C" int __tsan_atomic##bits##_##name(volatile type* object, type* expected,    \
-                                                type value, int order, int);              \
-    extern "C" int __tsan_atomic##bits##_##name(volatile type* object, type* expected,    \
-                                                type value, int order, int) {             \
-        return schedules::exchangeIf(object, expected, value, order, CALLER);             \
+#define EXCHANGE_IF(bits, type, name)                                                              \
+    extern "C" int __tsan_atomic##bits##_##name(volatile type* object, type* expected, type value, \
+                                                int order, int);                                   \
+    extern "C" int __tsan_atomic##bits##_##name(volatile type* object, type* expected, type value, \
+                                                int order, int) {                                  \
+        return schedules::exchangeIf(object, expected, value, order, CALLER);                      \
     }
-#define ATOMICS(bits, type)                                                                  \
-    extern "C" type __tsan_atomic##bits##_load(const volatile type* object, int order);      \
-    extern "C" type __tsan_atomic##bits##_load(const volatile type* object, int order) {     \
-        return schedules::load(object, order, CALLER);                                       \
-    }                                                                                        \
-    extern "C" void __tsan_atomic##bits##_store(volatile type* object, type value, int order); \
-    extern "C" void __tsan_atomic##bits##_store(volatile type* object, type value,           \
-                                                int order) {                                 \
-        schedules::store(object, value, order, CALLER);                                      \
-    }                                                                                        \
-    FETCH(bits, type, exchange, (static_cast<void>(old), operand))                           \
-    FETCH(bits, type, fetch_add, old + operand)                                              \
-    FETCH(bits, type, fetch_sub, old - operand)                                              \
-    FETCH(bits, type, fetch_and, old& operand)                                               \
-    FETCH(bits, type, fetch_or, old | operand)                                               \
-    FETCH(bits, type, fetch_xor, old ^ operand)                                              \
-    EXCHANGE_IF(bits, type, compare_exchange_strong)                                         \
-    EXCHANGE_IF(bits, type, compare_exchange_weak)
+// clang++'s one form of both.
+#define EXCHANGE_IF_VALUE(bits, type)                                       \
+    extern "C" type __tsan_atomic##bits##_compare_exchange_val(             \
+        volatile type* object, type expected, type value, int order, int);  \
+    extern "C" type __tsan_atomic##bits##_compare_exchange_val(             \
+        volatile type* object, type expected, type value, int order, int) { \
+        schedules::exchangeIf(object, &expected, value, order, CALLER);     \
+        return expected;                                                    \
+    }
+#define ATOMICS(bits, type)                                                                     \
+    extern "C" type __tsan_atomic##bits##_load(const volatile type* object, int order);         \
+    extern "C" type __tsan_atomic##bits##_load(const volatile type* object, int order) {        \
+        return schedules::load(object, order, CALLER);                                          \
+    }                                                                                           \
+    extern "C" void __tsan_atomic##bits##_store(volatile type* object, type value, int order);  \
+    extern "C" void __tsan_atomic##bits##_store(volatile type* object, type value, int order) { \
+        schedules::store(object, value, order, CALLER);                                         \
+    }                                                                                           \
+    FETCH(bits, type, exchange, (static_cast<void>(old), operand))                              \
+    FETCH(bits, type, fetch_add, old + operand)                                                 \
+    FETCH(bits, type, fetch_sub, old - operand)                                                 \
+    FETCH(bits, type, fetch_and, old& operand)                                                  \
+    FETCH(bits, type, fetch_or, old | operand)                                                  \
+    FETCH(bits, type, fetch_xor, old ^ operand)                                                 \
+    EXCHANGE_IF(bits, type, compare_exchange_strong)                                            \
+    EXCHANGE_IF(bits, type, compare_exchange_weak)                                              \
+    EXCHANGE_IF_VALUE(bits, type)
 
 ATOMICS(8, std::uint8_t)
 ATOMICS(16, std::uint16_t)

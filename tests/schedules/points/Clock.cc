@@ -9,9 +9,9 @@
 
 #include "points/MutexModel.h"
 
-// The time, the same in every run; the locks that the C library holds while it converts times by the
-// time zone, and while it looks up an error's text in the language of the user; and the conversions of
-// printf, which read their arguments more than once.
+// The time, the same in every run; the locks that the C library holds while it converts times by
+// the time zone, and while it looks up an error's text in the language of the user; and the
+// conversions of printf, which read their arguments more than once.
 
 namespace schedules {
 
@@ -33,8 +33,8 @@ void advanceClock(unsigned seconds) {
 
 }  // namespace schedules
 
-using schedules::now;
 using schedules::catalogueLock;
+using schedules::now;
 using schedules::zoneLock;
 
 SCHEDULES_REAL(struct tm*, localtime_r, (const time_t*, struct tm*));

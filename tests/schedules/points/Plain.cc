@@ -9,16 +9,16 @@
 
 using schedules::Races;
 
-#define ACCESS(name, size, writes)                                      \
-    extern "C" void __tsan_##name(void* where);                         \
-    extern "C" void __tsan_##name(void* where) {                        \
-        Races::access(where, size, writes, SCHEDULES_CALLER);           \
+#define ACCESS(name, size, writes)                            \
+    extern "C" void __tsan_##name(void* where);               \
+    extern "C" void __tsan_##name(void* where) {              \
+        Races::access(where, size, writes, SCHEDULES_CALLER); \
     }
-#define SIZES(name, writes)      \
-    ACCESS(name##1, 1, writes)   \
-    ACCESS(name##2, 2, writes)   \
-    ACCESS(name##4, 4, writes)   \
-    ACCESS(name##8, 8, writes)   \
+#define SIZES(name, writes)    \
+    ACCESS(name##1, 1, writes) \
+    ACCESS(name##2, 2, writes) \
+    ACCESS(name##4, 4, writes) \
+    ACCESS(name##8, 8, writes) \
     ACCESS(name##16, 16, writes)
 
 SIZES(read, false)
@@ -52,11 +52,24 @@ void __tsan_write_range(void* where, std::size_t size) {
 }
 }
 
+// clang++ has names of its own for what is copied.
+extern "C" {
+void* __tsan_memcpy(void* to, const void* from, size_t size);
+void* __tsan_memmove(void* to, const void* from, size_t size);
+void* __tsan_memset(void* to, int value, size_t size);
+}
+
 SCHEDULES_REAL(void*, memcpy, (void*, const void*, size_t));
 SCHEDULES_REAL(void*, memmove, (void*, const void*, size_t));
 SCHEDULES_REAL(void*, memset, (void*, int, size_t));
 
 SCHEDULES_WRAP(void*, memcpy, (void* to, const void* from, size_t size)) {
+    Races::access(from, size, false, SCHEDULES_CALLER);
+    Races::access(to, size, true, SCHEDULES_CALLER);
+    return __real_memcpy(to, from, size);
+}
+
+void* __tsan_memcpy(void* to, const void* from, size_t size) {
     Races::access(from, size, false, SCHEDULES_CALLER);
     Races::access(to, size, true, SCHEDULES_CALLER);
     return __real_memcpy(to, from, size);
@@ -68,7 +81,18 @@ SCHEDULES_WRAP(void*, memmove, (void* to, const void* from, size_t size)) {
     return __real_memmove(to, from, size);
 }
 
+void* __tsan_memmove(void* to, const void* from, size_t size) {
+    Races::access(from, size, false, SCHEDULES_CALLER);
+    Races::access(to, size, true, SCHEDULES_CALLER);
+    return __real_memmove(to, from, size);
+}
+
 SCHEDULES_WRAP(void*, memset, (void* to, int value, size_t size)) {
+    Races::access(to, size, true, SCHEDULES_CALLER);
+    return __real_memset(to, value, size);
+}
+
+void* __tsan_memset(void* to, int value, size_t size) {
     Races::access(to, size, true, SCHEDULES_CALLER);
     return __real_memset(to, value, size);
 }

@@ -62,8 +62,7 @@ void atForkFromTheBeginning(void (*prepare)(), void (*parent)(), void (*child)()
 using schedules::handlerCount;
 using schedules::handlers;
 
-SCHEDULES_WRAP(int, pthread_atfork,
-               (void (*prepare)(), void (*parent)(), void (*child)())) {
+SCHEDULES_WRAP(int, pthread_atfork, (void (*prepare)(), void (*parent)(), void (*child)())) {
     if (handlerCount == schedules::kMostHandlers) return ENOMEM;
     handlers[handlerCount++] = {prepare, parent, child};
     return 0;

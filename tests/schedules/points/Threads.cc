@@ -5,8 +5,7 @@
 #include "points/ThreadSpecific.h"
 #include "points/Wrap.h"
 
-SCHEDULES_REAL(int, pthread_create,
-               (pthread_t*, const pthread_attr_t*, void* (*)(void*), void*));
+SCHEDULES_REAL(int, pthread_create, (pthread_t*, const pthread_attr_t*, void* (*)(void*), void*));
 SCHEDULES_REAL(int, pthread_join, (pthread_t, void**));
 SCHEDULES_REAL(int, pthread_detach, (pthread_t));
 

@@ -5,8 +5,8 @@
 // How a call of the library reaches us: the linker's --wrap (CMakeLists.txt lists the names) sends
 // it to __wrap_NAME, and __real_NAME is the C library's.
 #define SCHEDULES_REAL(result, name, parameters) extern "C" result __real_##name parameters
-#define SCHEDULES_WRAP(result, name, parameters)     \
-    extern "C" result __wrap_##name parameters;      \
+#define SCHEDULES_WRAP(result, name, parameters) \
+    extern "C" result __wrap_##name parameters;  \
     extern "C" result __wrap_##name parameters
 
 // Where in the library the call stands.

@@ -31,9 +31,8 @@ std::string checkThree(const Remains& remains) {
 }
 
 void twoChannels() {
-    configure(
-        "rootCategory=INFO,A\ncategory.net=DEBUG,B,A\n" + kFile +
-        "appender.B=File\nappender.B.fileName=other\n");
+    configure("rootCategory=INFO,A\ncategory.net=DEBUG,B,A\n" + kFile +
+              "appender.B=File\nappender.B.fileName=other\n");
     Logger root("test");
     Logger net("net");
     Parallel threads{[&] { net.debug("one"); }, [&] { root.info("two"); }};
@@ -42,8 +41,8 @@ void twoChannels() {
 }
 
 std::string checkTwoChannels(const Remains& remains) {
-    const std::string wrong = compare("the other log", Remains::lines(remains.file("other")),
-                                      {"one", "three"});
+    const std::string wrong =
+        compare("the other log", Remains::lines(remains.file("other")), {"one", "three"});
     return wrong.empty() ? checkThree(remains) : wrong;
 }
 
@@ -117,7 +116,8 @@ void channelMade() {
 
 // The one that fails does not keep the line from the one that works, and is told of there.
 void oneFails() {
-    configure("rootCategory=INFO,F,A\n" + kFile + "appender.F=File\nappender.F.fileName=/dev/full\n");
+    configure("rootCategory=INFO,F,A\n" + kFile +
+              "appender.F=File\nappender.F.fileName=/dev/full\n");
     Logger logger("test");
     Parallel threads{[&] { logger.info("one"); }};
     logger.info("two");

@@ -14,9 +14,10 @@ namespace {
 Logger* handlersLogger = nullptr;
 
 void besideLogging() {
-    configure("rootCategory=INFO,F,A\nappender.A=File\nappender.A.fileName=log\n"
-              "appender.A.layout.ConversionPattern=%d{%Y} %m%n\n"
-              "appender.F=File\nappender.F.fileName=/dev/full\n");
+    configure(
+        "rootCategory=INFO,F,A\nappender.A=File\nappender.A.fileName=log\n"
+        "appender.A.layout.ConversionPattern=%d{%Y} %m%n\n"
+        "appender.F=File\nappender.F.fileName=/dev/full\n");
     Logger& logger = *new Logger("test");
     handlersLogger = &logger;
     std::atexit([] { handlersLogger->info("handler"); });

@@ -15,8 +15,9 @@ namespace schedules {
 
 namespace {
 
-constexpr const char* kDated = "rootCategory=INFO,A\nappender.A=File\nappender.A.fileName=log\n"
-                               "appender.A.layout.ConversionPattern=%d{%Y} %m%n\n";
+constexpr const char* kDated =
+    "rootCategory=INFO,A\nappender.A=File\nappender.A.fileName=log\n"
+    "appender.A.layout.ConversionPattern=%d{%Y} %m%n\n";
 
 void withDates() {
     configure(kDated);
@@ -124,8 +125,9 @@ std::string checkStderr(const Remains& remains) {
 
 // Each line makes the file a backup; the child goes on where its parent was.
 void rotating() {
-    configure("rootCategory=INFO,A\nappender.A=File\nappender.A.fileName=log\n"
-              "appender.A.maxFileSize=2\nappender.A.maxBackupIndex=5\n");
+    configure(
+        "rootCategory=INFO,A\nappender.A=File\nappender.A.fileName=log\n"
+        "appender.A.maxFileSize=2\nappender.A.maxBackupIndex=5\n");
     Logger logger("test");
     Parallel threads{[&] { logger.info(std::string("parent")); }};
     inForkedChild([&] { logger.info(std::string("child")); });
@@ -143,8 +145,9 @@ std::string checkRotating(const Remains& remains) {
 Logger* handlersLogger = nullptr;
 
 void handlerLogs() {
-    configure("rootCategory=INFO,A\nappender.A=File\nappender.A.fileName=log\n"
-              "appender.A.layout.ConversionPattern=%d{%Y} %m%n\n");
+    configure(
+        "rootCategory=INFO,A\nappender.A=File\nappender.A.fileName=log\n"
+        "appender.A.layout.ConversionPattern=%d{%Y} %m%n\n");
     Logger logger("test");
     handlersLogger = &logger;
     atForkFromTheBeginning([] { handlersLogger->info("prepare"); },

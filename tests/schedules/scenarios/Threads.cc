@@ -15,8 +15,9 @@ namespace schedules {
 
 namespace {
 
-constexpr const char* kNames = "rootCategory=INFO,A\nappender.A=File\nappender.A.fileName=log\n"
-                               "appender.A.layout.ConversionPattern=%t %m%n\n";
+constexpr const char* kNames =
+    "rootCategory=INFO,A\nappender.A=File\nappender.A.fileName=log\n"
+    "appender.A.layout.ConversionPattern=%t %m%n\n";
 
 void knowThemselves() {
     const Thread mainThread;

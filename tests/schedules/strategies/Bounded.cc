@@ -85,8 +85,7 @@ void Bounded::addDepartures(const Schedule& from) {
         const Decision& decision = board.decision[i];
         if (static_cast<long>(decision.step) <= last) continue;
         for (unsigned thread = 0; thread < kMaxThreads; ++thread) {
-            const ThreadMask possible =
-                decision.ready | decision.couldTimeOut | decision.couldWake;
+            const ThreadMask possible = decision.ready | decision.couldTimeOut | decision.couldWake;
             if (thread == decision.chosen || (possible & bit(thread)) == 0) continue;
             const unsigned cost = isUnforced(decision, thread) ? 1 : 0;
             if (from.preemptions + cost >= _todo.size()) continue;

@@ -1,4 +1,4 @@
-# Completion of korvex-logcheck in bash: options, files, directories, users.
+# Completion of korvex-logcheck in bash: options, engines, files, directories, users.
 # shellcheck shell=bash
 
 _korvex_logcheck() {
@@ -21,11 +21,16 @@ _korvex_logcheck() {
             mapfile -t COMPREPLY < <(compgen -u -- "$current")
             return
             ;;
-        --channel) return ;; # anybody's name
+        --export)
+            mapfile -t COMPREPLY < <(compgen -W 'list lnav rsyslog syslog-ng fluent-bit vector loki
+                logstash pcre' -- "$current")
+            return
+            ;;
+        --channel | --appender) return ;; # anybody's name
     esac
     if [[ -z $ended && $current == -* ]]; then
         mapfile -t COMPREPLY < <(compgen -W '--home --channel --paths --user --fix --json --quiet
-            --codes --version --help' -- "$current")
+            --codes --export --appender --version --help' -- "$current")
     else
         compopt -o filenames
         mapfile -t COMPREPLY < <(compgen -f -- "$current")

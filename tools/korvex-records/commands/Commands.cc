@@ -60,7 +60,8 @@ const std::vector<Command>& commands() {
         {"diff", "FILE", "what differs in another record file", "long", 1, 1, false, runDiff},
         {"stats", "[PREFIX]", "how large keys and values are", "key-escaped", 0, 1, false,
          runStats},
-        {"salvage", "", "what is whole in a damaged file", "output", 0, 0, true, runSalvage},
+        {"salvage", "", "what is whole in a damaged file", "output any-version", 0, 0, true,
+         runSalvage},
         {"help", "[VERB]", "show this text, or a verb's", "", 0, 1, false, runHelp}};
     return kCommands;
 }

@@ -22,11 +22,19 @@ void refusePresent(const Pathname& output) {
     if (isThere(output)) throw Failure(IO_ERROR, output + ": is there already; not written to");
 }
 
+// The records of another version may mean something else in a file of this one.
+void refuseOtherVersion(const OpenFile& file) {
+    StrictReader reader = file.reader();
+    static_cast<void>(reader.next());
+    requireOwnVersion(file.name(), reader.found().version);
+}
+
 }  // namespace
 
 Status runSalvage(const Options& options, const std::vector<std::string>&) {
     const OpenFile file(recordFilePath(options));
     if (options.output) refusePresent(*options.output);
+    if (options.output && !options.anyVersion) refuseOtherVersion(file);
     RecordMemory memory;
     std::uint64_t records = 0;
     std::uint64_t gaps = 0;

@@ -49,11 +49,7 @@ void scanForChange(const OpenFile& file, bool anyVersion, std::uint64_t& records
         throw Failure(DAMAGED, damage(file.name(), found) +
                                    "; not written to (salvage writes what is whole elsewhere)");
     }
-    if (!anyVersion && !found.version.empty() && found.version != kVersion) {
-        throw Failure(IO_ERROR, file.name() + ": its version is \"" + escaped(found.version) +
-                                    "\", not \"" + std::string(kVersion) +
-                                    "\"; not written to without --any-version");
-    }
+    if (!anyVersion) requireOwnVersion(file.name(), found.version);
     records = found.records;
 }
 
@@ -109,6 +105,12 @@ void changeRecordFile(const Options& options, const Change& change) {
     const Patience patience(options.wait);
     while (!attempt(name, options, change, patience))
         continue;
+}
+
+void requireOwnVersion(const Pathname& name, const std::string& version) {
+    if (version.empty() || version == kVersion) return;
+    throw Failure(IO_ERROR, name + ": its version is \"" + escaped(version) + "\", not \"" +
+                                std::string(kVersion) + "\"; not written without --any-version");
 }
 
 void createRecordFile(const Pathname& name, const RecordMemory& memory) {

@@ -19,6 +19,9 @@ struct Change {
 // --dry-run nothing is locked or saved. Throws Failure.
 void changeRecordFile(const Options& options, const Change& change);
 
+// Throws Failure IO_ERROR unless the file is of the version that is written, or of none.
+void requireOwnVersion(const Pathname& name, const std::string& version);
+
 // Makes a record file of what is in memory. Throws Failure IO_ERROR, also when there is a file of
 // that name.
 void createRecordFile(const Pathname& name, const RecordMemory& memory);

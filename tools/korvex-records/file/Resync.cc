@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <optional>
 #include <string>
+#include <unordered_set>
 
 #include "text/Utf8.h"
 
@@ -75,13 +76,25 @@ class Search {
         return !isRefusedKey(*key) && (!before || *key > *before);
     }
 
+    // Asked for each byte: most places are none by their first length.
+    bool mayBegin(std::uint64_t place) const {
+        const std::uint64_t left = _file.size() - place;
+        return left >= 8 && _file.numberAt(place) <= left - 8;
+    }
+
     // Whether records follow on each other from there: to the end, or `enough` of them, the last
     // one ending beyond the fault. Where what was read before is met, they lead to the fault.
     bool followOn(std::uint64_t place, Key before, unsigned enough) const {
         RecordFrame frame;
         Key key;
+        std::vector<std::uint64_t> passed;
+        std::unordered_set<std::uint64_t>& dead = enough == kEnough ? _tooFew : _notToEnd;
         for (unsigned count = 0; count < enough || place <= _at; ++count) {
-            if (place == _at || wasRead(place) || !read(place, before, frame, key)) return false;
+            if (!read(place, before, frame, key) || wasRead(place) || dead.count(place) > 0) {
+                dead.insert(passed.begin(), passed.end());
+                return false;
+            }
+            passed.push_back(place);
             before = std::move(key);
             place = frame.end();
             if (place == _file.size()) return true;
@@ -97,7 +110,7 @@ class Search {
     // on from the next length as well, so that keys might be values and values keys, its key must
     // be text.
     bool isLikely(std::uint64_t begin, std::uint64_t place, const Key& before) const {
-        if (!tracesTo(begin, place, before) || !followOn(place, before, kEnough)) return false;
+        if (!followOn(place, before, kEnough) || !tracesTo(begin, place, before)) return false;
         const std::uint64_t nextLength = place + 4 + _file.numberAt(place);
         return !followOn(nextLength, before, kEnough) || tracesTo(begin, place, before, true);
     }
@@ -125,10 +138,12 @@ class Search {
             const RecordFrame& frame = _before[i];
             const Key key = orderOf(frame);
             for (std::uint64_t place = frame.begin + 8; place < frame.end(); ++place) {
-                if (!tracesTo(frame.begin, place, formerKey)) continue;
-                if (!leadsToEnd(place, formerKey) && !isLikely(frame.begin, place, formerKey)) {
-                    continue;
-                }
+                if (!mayBegin(place)) continue;
+                // The trace comes last, because it costs a look at all that is before the place.
+                const bool isBeginning = leadsToEnd(place, formerKey)
+                                             ? tracesTo(frame.begin, place, formerKey)
+                                             : isLikely(frame.begin, place, formerKey);
+                if (!isBeginning) continue;
                 result.next = place;
                 result.kept = i;
                 result.isExact = true;
@@ -141,9 +156,9 @@ class Search {
 
     std::uint64_t behind() const {
         for (std::uint64_t place = _at + 1; place < _file.size(); ++place)
-            if (leadsToEnd(place, _lastKey)) return better(place);
+            if (mayBegin(place) && leadsToEnd(place, _lastKey)) return better(place);
         for (std::uint64_t place = _at + 8; place < _file.size(); ++place)
-            if (isLikely(_at, place, _lastKey)) return place;
+            if (mayBegin(place) && isLikely(_at, place, _lastKey)) return place;
         return _file.size();
     }
 
@@ -223,6 +238,10 @@ class Search {
     const std::uint64_t _at;
     const std::vector<RecordFrame>& _before;
     Key _lastKey;
+    // From these places records follow on each other, but not far enough. Without them a file whose
+    // values are in order, as its keys are, would be walked through from each of its values.
+    mutable std::unordered_set<std::uint64_t> _notToEnd;
+    mutable std::unordered_set<std::uint64_t> _tooFew;
 };
 
 }  // namespace

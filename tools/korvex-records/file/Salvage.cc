@@ -11,12 +11,12 @@
 
 namespace {
 
-constexpr std::size_t kProbe = 4096;
+constexpr std::size_t kProbe = 1 << 16;
 
 class Salvager {
   public:
     Salvager(int fd, std::uint64_t size, const std::string& name, const Salvaging& to)
-        : _to(to), _file(fd, size, name), _probe(fd, size, name, kProbe) {}
+        : _to(to), _file(fd, size, name), _probe(fd, size, name, kProbe, kProbe / 2) {}
 
     void run() {
         while (_at < _file.size()) {
