@@ -7,6 +7,10 @@ target_compile_options(korvex_warnings INTERFACE
   -UKORVEX_QUALIFIED_NAMES
   # __FILE__ in assertions reads "src/..." wherever the tree lies.
   "-fmacro-prefix-map=${PROJECT_SOURCE_DIR}/=")
+if(KORVEX_RELATIVE_PATHS)
+  target_compile_options(korvex_flags INTERFACE
+    "-ffile-prefix-map=${PROJECT_SOURCE_DIR}/=" "-ffile-prefix-map=${PROJECT_BINARY_DIR}=.")
+endif()
 if(CMAKE_CXX_COMPILER_ID MATCHES Clang)
   target_compile_options(korvex_warnings INTERFACE -Wthread-safety)
 endif()

@@ -11,7 +11,7 @@ here=$build/package-test
 log=$here/log
 mkdir -p "$here"
 : > "$log"
-version=$(sed -n 's/^Version: //p' "$build/package/korvex.pc")
+version=$(sed -n '1s/.*(\(.*\)).*/\1/p' debian/changelog)
 abi=libkorvex${version%%.*}
 trap '[ $? -eq 0 ] || { tail -n 30 "$log"; echo "package-test: FAILED; the log is $log"; }' EXIT
 
@@ -72,6 +72,29 @@ test_tools() {
     say "the tools run, and leave nothing behind"
 }
 
+# An older version, which is this one under another number, is upgraded: the record file stays and is read.
+test_upgrade() {
+    # shellcheck disable=SC2016  # the inner shell's own dollars
+    inside "$here/plain" env ABI="$abi" VERSION="$version" sh -euc '
+        cd /packages
+        for package in "$ABI" korvex-tools; do
+            dpkg-deb -R ${package}_${VERSION}_*.deb /tmp/$package
+            sed -i "s/^Version: .*/Version: 0.9.9/; s/(>= $VERSION)/(>= 0.9.9)/" /tmp/$package/DEBIAN/control
+            dpkg-deb -b /tmp/$package /tmp/$package.deb
+        done
+        dpkg -i "/tmp/$ABI.deb" /tmp/korvex-tools.deb
+        export KORVEX_HOME=/root/home KORVEX_DB=/root/db
+        mkdir -p /root/home/etc /root/db/hashDb
+        echo log4cpp.rootCategory=ERROR > /root/home/etc/log-cmdline.cfg
+        korvex-records --create put fruit/apple red
+        cp -p /root/db/hashDb/data /root/before
+        dpkg -i ${ABI}_${VERSION}_*.deb korvex-tools_${VERSION}_*.deb
+        dpkg -s korvex-tools | grep -qx "Version: $VERSION"
+        cmp /root/db/hashDb/data /root/before
+        [ "$(korvex-records get fruit/apple)" = red ]' >> "$log" 2>&1
+    say "an upgrade keeps the record file"
+}
+
 # use KIND WAY: the stranger, with static ones asked for by their own name.
 use() {
     local static=
@@ -110,11 +133,20 @@ wants() {
 }
 
 test_tools
+test_upgrade
 root_with development "$abi" libkorvex-dev korvex-doc g++ cmake ninja-build
 mkdir "$here/development/korvex"
 source_files | tar -c --null -T - | tar -x -C "$here/development/korvex"
 use_all "no xmlwrapp"
 build_examples
+mkdir "$here/development/autopkgtest"
+for test in debian/tests/*; do
+    case $test in */control) continue ;; esac
+    [ "${test##*/}" != tools ] || continue  # run above, where there is nothing else
+    # shellcheck disable=SC2016  # the inner shell's own dollars
+    inside "$here/development" sh -euc 'cd /korvex && AUTOPKGTEST_TMP=/autopkgtest "$0"' "$test" >> "$log" 2>&1
+    say "autopkgtest: ${test##*/}"
+done
 inside "$here/development" /korvex/tests/checks/exports.sh "/usr/lib/$(uname -m)-linux-gnu/libkorvex.so"
 for other in 0.9 1.99 2.0; do
     ! wants $other || { say "$other is content with $version"; exit 1; }

@@ -6,7 +6,7 @@ set -euo pipefail
 . scripts/dev/source-files.sh
 
 here=${KORVEX_BUILD_DIR:-$PWD/build}/portability
-machines=(i386 i386-time64 libc++ arm64 s390x)
+machines=(i386 i386-time64 libc++ arm64 s390x debian13 debian13-c++20 debian13-c++23 debian13-clang)
 [ $# -eq 0 ] || machines=("$@")
 
 common="cmake ninja-build pkg-config googletest logrotate procps"
@@ -15,16 +15,26 @@ packages_native="$common g++-multilib clang libc++-dev libc++abi-dev libpopt-dev
 packages_cross="$common qemu-user-static g++-aarch64-linux-gnu g++-s390x-linux-gnu
     libpopt-dev:arm64 libxml2-dev:arm64 libpopt-dev:s390x libxml2-dev:s390x"
 
-root_of() { case $1 in arm64 | s390x) echo cross ;; *) echo native ;; esac; }
+packages_debian13="$common g++ clang-19 libpopt-dev libxml2-dev"
+
+root_of() {
+    case $1 in
+        arm64 | s390x) echo cross ;;
+        debian13*) echo debian13 ;;
+        *) echo native ;;
+    esac
+}
 
 make_root() {
     local root=$here/$1
     [ ! -e "$root/ready" ] || return 0
-    new_root "$root"
-    local architectures packages
+    local architectures='' packages suite=bookworm
+    [ "$1" != debian13 ] || suite=trixie
+    new_root "$root" $suite
     case $1 in
         native) architectures=i386 packages=$packages_native ;;
         cross) architectures="arm64 s390x" packages=$packages_cross ;;
+        debian13) packages=$packages_debian13 ;;
     esac
     # shellcheck disable=SC2086  # lists
     inside "$root" sh -c 'for a in $0; do dpkg --add-architecture $a; done; apt-get update -qq &&
@@ -35,11 +45,15 @@ make_root() {
 
 # What is special about a machine.
 describe() {
-    triple='' emulator='' cc=g++ flags='' link='' archdir=''
+    triple='' emulator='' cc=g++ flags='' standard=17 archdir=x86_64-linux-gnu
     case $1 in
         i386) flags=-m32 archdir=i386-linux-gnu ;;
         i386-time64) flags="-m32 -D_FILE_OFFSET_BITS=64 -D_TIME_BITS=64" archdir=i386-linux-gnu ;;
-        libc++) cc=clang++ flags=-stdlib=libc++ archdir=x86_64-linux-gnu ;;
+        libc++) cc=clang++ flags=-stdlib=libc++ ;;
+        debian13) ;;
+        debian13-c++20) standard=20 ;;
+        debian13-c++23) standard=23 ;;
+        debian13-clang) cc=clang++-19 ;;
         arm64) triple=aarch64-linux-gnu emulator=qemu-aarch64-static archdir=$triple ;;
         s390x) triple=s390x-linux-gnu emulator=qemu-s390x-static archdir=$triple ;;
     esac
@@ -53,13 +67,13 @@ build() {
     mkdir -p "$here/$root/korvex"
     source_files | tar -c --null -T - | tar -x -C "$here/$root/korvex"
     inside "$here/$root" sh -euc '
-        machine=$1 cc=$2 flags=$3 archdir=$4 emulator=$5
+        machine=$1 cc=$2 flags=$3 archdir=$4 standard=$5 emulator=$6
         export PKG_CONFIG_LIBDIR=/usr/lib/$archdir/pkgconfig:/usr/share/pkgconfig
         gtest=/korvex-build/$machine/gtest
         set -- -G Ninja -DCMAKE_CXX_COMPILER="$cc" -DCMAKE_CXX_FLAGS="$flags" \
             -DCMAKE_C_COMPILER="$(echo "$cc" | sed "s/clang++/clang/;s/g++/gcc/")" \
             -DCMAKE_C_FLAGS="$(echo "$flags" | sed "s/-stdlib=[^ ]*//")" \
-            -DCMAKE_PREFIX_PATH="$gtest" -DCMAKE_BUILD_TYPE=Release -DCMAKE_CXX_FLAGS_RELEASE="-O1 -DNDEBUG"
+            -DCMAKE_CXX_STANDARD="$standard" -DCMAKE_PREFIX_PATH="$gtest" -DCMAKE_BUILD_TYPE=Release -DCMAKE_CXX_FLAGS_RELEASE="-O1 -DNDEBUG"
         if [ -n "$emulator" ]; then
             set -- "$@" -DCMAKE_SYSTEM_NAME=Linux -DCMAKE_CROSSCOMPILING_EMULATOR="$emulator"
         fi
@@ -69,7 +83,7 @@ build() {
         fi
         cmake -S /korvex -B "/korvex-build/$machine/korvex" -DKORVEX_WERROR=ON "$@"
         cmake --build "/korvex-build/$machine/korvex" -j "$(nproc)"' \
-        sh "$machine" "$cc" "$flags" "$archdir" "$emulator" > "$here/$machine-build.log" 2>&1
+        sh "$machine" "$cc" "$flags" "$archdir" "$standard" "$emulator" > "$here/$machine-build.log" 2>&1
 }
 
 # Runs the tests in one process: the checks of sources and packages are the host's business.

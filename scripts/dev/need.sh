@@ -5,6 +5,7 @@
 there() {
     dpkg-query -W -f '${Status}\n' "$1" 2> /dev/null | grep -q 'ok installed' && return
     case $1 in
+        abigail-tools) command -v abidw ;;
         acl) command -v setfacl ;;
         locales) command -v locale-gen ;;
         ninja-build) command -v ninja ;;
@@ -13,6 +14,7 @@ there() {
         libxml2-dev) pkg-config --exists libxml-2.0 ;;
         libgtest-dev) pkg-config --exists gtest ;;
         libgmock-dev) pkg-config --exists gmock ;;
+        liblog4cplus-dev) pkg-config --exists log4cplus ;;
         *) PATH=$PATH:/usr/sbin:/sbin command -v "$1" ;;
     esac > /dev/null 2>&1
 }

@@ -63,5 +63,9 @@ if [ "$libdir" != lib ]; then
 fi
 [ "$(pkg-config --variable=xmlwrapp korvex)" = $xmlwrapp ]
 grep -q "set(Korvex_XMLWRAPP \"$xmlwrapp\")" "$(dirname "$pc_dir")/cmake/Korvex/KorvexConfig.cmake"
+# The two kinds have names that no program mistakes.
+name=libkorvex
+[ $xmlwrapp = compat ] || name=libkorvex-xmlwrapp
+[ "$(cd "$(dirname "$pc_dir")" && ls libkorvex*.* | sed 's/\..*//' | sort -u)" = $name ]
 # Our own class is installed only where there is no other.
 [ "$(find "$prefix" -path '*korvex-compat*' -name node.h | wc -l)" = "$([ $xmlwrapp = compat ] && echo 1 || echo 0)" ]
