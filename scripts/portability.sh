@@ -6,7 +6,7 @@ set -euo pipefail
 . scripts/dev/source-files.sh
 
 here=${KORVEX_BUILD_DIR:-$PWD/build}/portability
-machines=(i386 i386-time64 libc++ arm64 s390x debian13 debian13-c++20 debian13-c++23 debian13-clang)
+machines=(i386 libc++ arm64 s390x debian13 debian13-c++20 debian13-c++23 debian13-clang)
 [ $# -eq 0 ] || machines=("$@")
 
 common="cmake ninja-build pkg-config googletest logrotate procps"
@@ -48,7 +48,6 @@ describe() {
     triple='' emulator='' cc=g++ flags='' standard=17 archdir=x86_64-linux-gnu
     case $1 in
         i386) flags=-m32 archdir=i386-linux-gnu ;;
-        i386-time64) flags="-m32 -D_FILE_OFFSET_BITS=64 -D_TIME_BITS=64" archdir=i386-linux-gnu ;;
         libc++) cc=clang++ flags=-stdlib=libc++ ;;
         debian13) ;;
         debian13-c++20) standard=20 ;;

@@ -10,6 +10,7 @@ set(KORVEX_WRAPPED_CALLS
 
 # Where a 32-bit machine is given a 64-bit time_t and off_t, some have other names (LinkNames.h).
 include(CheckTypeSize)
+list(TRANSFORM KORVEX_WIDE_TYPES PREPEND -D OUTPUT_VARIABLE CMAKE_REQUIRED_DEFINITIONS)
 check_type_size(time_t SIZE_OF_TIME_T LANGUAGE CXX)
 if(CMAKE_SIZEOF_VOID_P EQUAL 4 AND SIZE_OF_TIME_T EQUAL 8)
   list(REMOVE_ITEM KORVEX_WRAPPED_CALLS
