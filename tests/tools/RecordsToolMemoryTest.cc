@@ -97,6 +97,9 @@ TEST_F(MemoryTest, OneRecordIsReadInTheMemoryOfOneRecord) {
         EXPECT_EQ(result.status, 0) << arguments[0] << result.err;
     }
     EXPECT_EQ(run({"put", "x", "1"}, "", limited).status, 4) << "the limit is one";
+    const ChildResult endless = run({"put", "-i", "/dev/zero", "x"}, "", limited);
+    EXPECT_EQ(endless.err, "korvex-records: out of memory\n");
+    EXPECT_EQ(endless.status, 4);
     EXPECT_EQ(stored().size(), records.size());
 }
 
