@@ -123,19 +123,20 @@ TEST_F(LoadTest, JsonReadsBackExactly) {
     std::string all;
     for (int c = 0; c < 256; ++c)
         all += static_cast<char>(c);
-    const std::string any = fileOf({{"", "\xff"},
-                                    {"\x01\"\\/\b\t\n", all},
-                                    {"gr\xC3\xBC\xC3\x9F \xF0\x9F\x98\x80", "\x7f"},
-                                    {"nul", "a\0b"s},
-                                    {"\xff", ""}});
+    const std::string any =
+        fileOf({{"", "\xff"},
+                {"\x01\"\\/\b\t\n", all},
+                {"gr\xC3\xBC\xC3\x9F \xF0\x9F\x98\x80", "\x7f\xC2\x80\xC2\x9F\xC2\xA0"},
+                {"nul", "a\0b"s},
+                {"\xff", ""}});
     writeFile(data, any);
     const std::string json = run({"dump", "--json"}).out;
     EXPECT_EQ(json.substr(0, json.find('\n')), "{\"key\":\"\",\"value_base64\":\"/w==\"}");
     EXPECT_THAT(json,
                 HasSubstr("\n{\"key\":\"\\u0001\\\"\\\\/\\u0008\\t\\n\",\"value_base64\":\"AAEC"));
-    EXPECT_THAT(
-        json,
-        HasSubstr("\n{\"key\":\"gr\xC3\xBC\xC3\x9F \xF0\x9F\x98\x80\",\"value\":\"\\u007f\"}\n"));
+    EXPECT_THAT(json,
+                HasSubstr("\n{\"key\":\"gr\xC3\xBC\xC3\x9F "
+                          "\xF0\x9F\x98\x80\",\"value\":\"\\u007f\\u0080\\u009f\xC2\xA0\"}\n"));
     EXPECT_THAT(json, HasSubstr("\n{\"key\":\"nul\",\"value\":\"a\\u0000b\"}\n"));
     EXPECT_THAT(json, HasSubstr("\n{\"key_base64\":\"/w==\",\"value\":\"\"}\n"));
     EXPECT_EQ(loaded({"load", "--json", "--replace"}, json),
