@@ -41,17 +41,20 @@ class MemoryTest : public RecordsToolTest {
 TEST_F(MemoryTest, ManyRecordsTakeAtMostOneAndAHalfTimesTheStoresMemory) {
     std::string records = fileOf({});
     std::string dump = "VERSION=3\nformat=print\nHEADER=END\n";
-    for (int i = 1000000; i < 1250000; ++i) {
+    std::string json;
+    for (int i = 1000000; i < 1250000; ++i) {  // short values: a record's own cost shows
         const std::string key = "key/" + std::to_string(i);
-        const std::string value = "value of the record " + std::to_string(i);
-        records += recordBytes(key, value);
-        dump += " " + key + "\n " + value + "\n";
+        records += recordBytes(key, "value");
+        dump += " " + key + "\n value\n";
+        json += "{\"key\":\"" + key + "\",\"value\":\"value\"}\n";
     }
+    writeFile(dir.file("json"), json);
     writeFile(data, records);
     writeFile(dir.file("dump"), dump + "DATA=END\n");
     const long nothing = peakOf([] { return 0; });
     records = std::string();
     dump = std::string();
+    json = std::string();
     const long store = peakOf([this] {
         RecordFileManager::instance()->setDBFile(Pathname(data));
         RecordFileManager::instance()->readFile();
@@ -68,6 +71,8 @@ TEST_F(MemoryTest, ManyRecordsTakeAtMostOneAndAHalfTimesTheStoresMemory) {
                                                {"dump"},
                                                {"dump", "--json"},
                                                {"diff", data},
+                                               {"load", "--json", dir.file("json")},
+                                               {"salvage", "-o", dir.file("salvaged")},
                                                {"stats"},
                                                {"check"}}) {
         EXPECT_LT(peakOfTool(arguments), store * 3 / 2) << testing::PrintToString(arguments);

@@ -4,6 +4,7 @@
 #include <optional>
 #include <string>
 #include <unordered_set>
+#include <vector>
 
 #include "text/Utf8.h"
 
@@ -28,7 +29,7 @@ using Key = std::optional<std::string>;  // none: any key may come next
 
 class Search {
   public:
-    Search(FileWindow& file, std::uint64_t at, const std::vector<RecordFrame>& before)
+    Search(FileWindow& file, std::uint64_t at, const std::deque<RecordFrame>& before)
         : _file(file), _at(at), _before(before) {
         if (!before.empty()) _lastKey = orderOf(before.back());
     }
@@ -236,7 +237,7 @@ class Search {
 
     FileWindow& _file;
     const std::uint64_t _at;
-    const std::vector<RecordFrame>& _before;
+    const std::deque<RecordFrame>& _before;
     Key _lastKey;
     // From these places records follow on each other, but not far enough. Without them a file whose
     // values are in order, as its keys are, would be walked through from each of its values.
@@ -246,6 +247,6 @@ class Search {
 
 }  // namespace
 
-Resync resync(FileWindow& file, std::uint64_t at, const std::vector<RecordFrame>& before) {
+Resync resync(FileWindow& file, std::uint64_t at, const std::deque<RecordFrame>& before) {
     return Search(file, at, before).run();
 }
