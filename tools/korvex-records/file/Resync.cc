@@ -125,11 +125,16 @@ class Search {
     }
 
     // The record at the fault has a key that no record may have, and nothing else is wrong with it.
+    // Or a damaged length made that key and leads from it to a value: then records follow on from
+    // the next length, too, or do not reach the end.
     std::optional<std::uint64_t> endOfRefused() const {
         RecordFrame frame;
         if (!readFrame(_file, _at, frame).empty()) return std::nullopt;
-        const bool goesOn = frame.end() == _file.size() || followOn(frame.end(), _lastKey, kEnough);
-        return goesOn ? std::optional<std::uint64_t>(frame.end()) : std::nullopt;
+        const std::uint64_t end = frame.end();
+        const bool goesOn = end == _file.size() || leadsToEnd(end, _lastKey) ||
+                            (followOn(end, _lastKey, kEnough) &&
+                             !followOn(end + 4 + _file.numberAt(end), _lastKey, kEnough));
+        return goesOn ? std::optional<std::uint64_t>(end) : std::nullopt;
     }
 
     // A length that grew: the next record begins within what was read before.
