@@ -359,6 +359,23 @@ TEST_F(TracedWriting, AFirstWriterThatIsKilledLeavesNoFileOrAWholeOneAndTheNextR
     EXPECT_EQ(stored(), before);
 }
 
+TEST_F(TracedWriting, AnotherFirstWriterMayMakeTheDirectoryMeanwhile) {
+    if (isEmulated()) GTEST_SKIP() << "the emulator has no ptrace";
+    const std::string hashDb = dir.file("db/hashDb");
+    int made = 0;
+    for (int k = 1;; ++k) {
+        std::filesystem::remove_all(hashDb);
+        const int status = runWith(k, {"--create", "put", "a", "1"}, [&] {
+            made += std::filesystem::create_directory(hashDb) ? 1 : 0;
+            return true;
+        });
+        if (ended()) break;
+        ASSERT_EQ(status, 0) << k;
+        ASSERT_EQ(stored(), before) << k;
+    }
+    EXPECT_GT(made, 10);
+}
+
 TEST_F(TracedWriting, WhatAnotherProgramWritesMeanwhileIsNotOverwritten) {
     if (isEmulated()) GTEST_SKIP() << "the emulator has no ptrace";
     const std::string theirs = fileOf({{"a", "1"}, {"server", "wrote"}});
