@@ -149,9 +149,8 @@ TEST_F(LogcheckKeysTest, AnAppenderThatOnlyARefusedLineNamesIsNotCalledUnused) {
     EXPECT_THAT(codes("rootCategory=INFO, a\n" + appender), ElementsAre("word.unknown"));
     EXPECT_THAT(codes("rootLogger=INFO, B\n" + appender),
                 ElementsAre("key.other-name", "appender.unused"));
-    EXPECT_THAT(
-        codes("rootCategory=INFO\nappender.B.x=A\n" + appender),
-        ElementsAre("appender.stderr", "appender.unused", "attribute.unknown", "appender.unused"));
+    EXPECT_THAT(codes("rootCategory=INFO\nappender.B.x=A\n" + appender),
+                ElementsAre("attribute.unknown", "appender.unused"));
 }
 
 TEST_F(LogcheckKeysTest, LevelsInTheWrongCaseAndOfOtherNames) {
@@ -313,6 +312,13 @@ TEST_F(LogcheckKeysTest, OneSlipIsOneMessage) {
                 ElementsAre("key.colon"));
     EXPECT_THAT(codes(root + "log4j.appender.A.fileName=/a\nappender.A.layout=BasicLayout\n"),
                 ElementsAre("key.prefix"));
+    EXPECT_THAT(codes(root + "apender.A.fileName=/a\nappender.A.maxFileSize=4096\n"
+                             "appender.A.maxBackupIndex=1\n"),
+                ElementsAre("key.unknown"));
+    EXPECT_THAT(codes(root + "appender.A.fileName/a\nappender.A.maxFileSize=4096\n"
+                             "appender.A.maxBackupIndex=1\n"),
+                ElementsAre("key.unknown"));
+    EXPECT_THAT(codes(good + "appender..A.fileName=/a\n"), ElementsAre("attribute.unknown"));
     EXPECT_THAT(codes(root + "appender.A.File=/a\nappender.A.maxFileSize=4096\n"
                              "appender.A.maxBackupIndex=1\n"),
                 ElementsAre("key.other-name"));

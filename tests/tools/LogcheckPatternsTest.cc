@@ -67,23 +67,31 @@ TEST_F(LogcheckPatternsTest, ConversionsThatThereAreNot) {
 TEST_F(LogcheckPatternsTest, TheLettersAreThoseOfTheLibrary) {
     const Logger logger("channel");
     const LogMsgMetadata md(&logger, WARN);
-    std::string all;
-    std::vector<std::string> expected;
+    std::size_t count = 0;
     for (char letter = 'A'; letter <= 'z'; ++letter) {
         if (letter > 'Z' && letter < 'a') continue;
         const std::string conversion = std::string("%") + letter;
         std::string line;
         LogFormat(conversion.c_str()).apply(line, md, "message");
-        if (line.empty()) expected.push_back(nothing(conversion));
-        all += conversion + ' ';
+        const std::vector<std::string> all = told(conversion + " %m%n");
+        if (line.empty()) {
+            ++count;
+            EXPECT_THAT(all, ElementsAre(testing::StartsWith("1: " + nothing(conversion))));
+        } else {
+            EXPECT_THAT(all, IsEmpty()) << conversion;
+        }
     }
-    EXPECT_EQ(expected.size(), 52U - 9U);
-    std::vector<std::string> got;
-    for (const std::string& line : told(all + "%n")) {
-        const std::string text = line.substr(line.find(' ') + 1);
-        got.push_back(text.substr(0, text.find("nothing") + 7));
-    }
-    EXPECT_EQ(got, expected);
+    EXPECT_EQ(count, 52U - 9U);
+}
+
+TEST_F(LogcheckPatternsTest, ADateOutsideOfItsBracesIsToldOnce) {
+    const std::string date =
+        ": warning: there is no conversion \"%Y\": it prints nothing; what is a date's stands in "
+        "%d{...} [pattern.unknown]";
+    EXPECT_THAT(told("%Y-%m-%d %H:%M:%S %p: %m%n"), ElementsAre("1" + date));
+    EXPECT_THAT(told("d{%Y-%m-%d %H:%M} %m%n"), ElementsAre("3" + date));
+    EXPECT_THAT(told("%%d{%Y-%m-%d %H:%M} %m%n"), ElementsAre("5" + date));
+    EXPECT_THAT(told("%H %m%n"), ElementsAre("1: " + nothing("%H") + " [pattern.unknown]"));
 }
 
 TEST_F(LogcheckPatternsTest, ABlankInAConversion) {
@@ -247,6 +255,16 @@ TEST_F(LogcheckPatternsTest, ADateWithoutAConversion) {
     EXPECT_THAT(told("%d{today} %m%n"), ElementsAre("4: warning: \"today\" has no conversion: each "
                                                     "line shows it as it stands [date.text]"));
     EXPECT_EQ(mended("%d{today} %m%n"), "%d{today} %m%n");
+}
+
+TEST_F(LogcheckPatternsTest, ALetterOfADateWithoutItsPercentSign) {
+    const std::string text =
+        "\" is no conversion: each line shows it as it stands; did you mean \"%";
+    EXPECT_THAT(told("%d{%Y-m-%d %H:M:%S,l %d} %m%n"),
+                ElementsAre("7: warning: \"m" + text + "m\"? [date.text]",
+                            "15: warning: \"M" + text + "M\"? [date.text]",
+                            "20: warning: \"l" + text + "l\"? [date.text]"));
+    EXPECT_THAT(told("%d{Y-%m-%d} %d{%H:%M:S} %m%n").size(), 2U);
 }
 
 TEST_F(LogcheckPatternsTest, ConversionsThatStrftimeDoesNotKnow) {

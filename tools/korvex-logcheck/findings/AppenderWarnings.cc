@@ -43,7 +43,7 @@ bool isMeantForFile(const Reading& reading, const Appender& appender) {
 
 void checkFile(const Reading& reading, const Appender& appender, Findings& to) {
     const bool told = isMeantToBeSet(reading.config, reading.source, appender, "fileName") ||
-                      !meantAppender(reading, appender).empty();
+                      !meantAppender(reading.config, appender).empty();
     if (told) return;
     for (const std::string_view complaint : appender.complaints) {
         if (complaint.find("has no filename") != 0) continue;
@@ -83,7 +83,7 @@ void checkUse(const Reading& reading, const Appender& appender, Findings& to) {
     }
     if (reading.config.users(*appender.made).empty() && !isMeantToBeUsed(reading, appender, to)) {
         tell(to, Code::APPENDER_UNUSED, place, called(appender) + " is used by nobody",
-             meantAppender(reading, appender));
+             meantAppender(reading.config, appender));
     }
 }
 
@@ -95,10 +95,18 @@ void checkRootAppender(const Reading& reading, Findings& to) {
     }
 }
 
+// Whether it is there only by attributes that are refused, and so told.
+bool isOnlyRefused(const Appender& appender) {
+    return appender.declarations.empty() &&
+           std::none_of(appender.attributes.begin(), appender.attributes.end(),
+                        [](const ConfigStatement& said) { return said.accepted; });
+}
+
 }  // namespace
 
 void findInAppenders(const Reading& reading, Findings& to) {
     for (const Appender& appender : reading.config.appenders) {
+        if (isOnlyRefused(appender)) continue;
         checkDeclared(reading, appender, to);
         checkFile(reading, appender, to);
         checkUse(reading, appender, to);

@@ -129,7 +129,7 @@ constexpr CodeRow kRows[] = {
     {Code::DATE_JAVA, "date.java", S::WARNING, M::WHERE_SURE, "a date in the Java form"},
     {Code::DATE_NAME, "date.name", S::WARNING, M::YES, "a named date layout misspelt"},
     {Code::DATE_TEXT, "date.text", S::WARNING, M::NO,
-     "a date without a conversion, which prints its own text"},
+     "a date, or a letter of it, without a conversion, which prints its own text"},
     {Code::DATE_UNKNOWN, "date.unknown", S::WARNING, M::WHERE_SURE,
      "a conversion that strftime does not know, or one cut short"},
     {Code::DATE_MINUTES, "date.minutes", S::WARNING, M::YES,

@@ -88,8 +88,24 @@ class DateCheck {
             tellRepeated(begin, end);
         } else if (hasJavaFieldsOnly(run)) {
             tellJava(begin, end, javaDate(run).pattern);
+        } else if (isBareLetter(begin, end)) {
+            tell(_to, Code::DATE_TEXT, _argument.part(begin, 1).place(),
+                 quoted(run) + " is no conversion: each line shows it as it stands",
+                 '%' + std::string(run));
         }
         return end;
+    }
+
+    // "%Y-m-%d": a letter for itself between the signs of a date or a time.
+    bool isBareLetter(std::size_t begin, std::size_t end) const {
+        constexpr std::string_view signs = "-:/.,";
+        const auto isSign = [&](std::size_t at) { return signs.find(_text[at]) != signs.npos; };
+        const bool before = begin > 0 && isSign(begin - 1);
+        const bool after = end < _text.size() && isSign(end);
+        const bool first = begin == 0 && after;
+        const bool last = before && (end == _text.size() || _text[end] == ' ');
+        return end - begin == 1 && std::string_view("YmdHMSly").find(_text[begin]) != signs.npos &&
+               ((before && after) || first || last);
     }
 
     // "%HH"; but seconds of the epoch may have their unit behind them.
@@ -166,7 +182,7 @@ class DateCheck {
             tellAt(begin, pos + 1 - begin, Code::DATE_MILLISECONDS,
                    "is the hour; only %l, without anything between, is the milliseconds");
         }
-        _conversionEnd = pos == begin + 1 ? pos + 1 : 0;
+        _conversionEnd = pos == begin + 1 ? pos + 1 : _text.npos;
         return pos + 1;
     }
 
@@ -187,7 +203,7 @@ class DateCheck {
     const Piece _argument;
     const std::string_view _text;
     Findings& _to;
-    std::size_t _conversionEnd = 0;  // of the last one that is a letter only
+    std::size_t _conversionEnd = std::string_view::npos;  // of the last one without a flag
 };
 
 }  // namespace

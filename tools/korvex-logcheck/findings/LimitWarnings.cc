@@ -65,7 +65,7 @@ void checkBackups(const Reading& reading, const Appender& appender, Findings& to
 
 void findInLimits(const Reading& reading, Findings& to) {
     for (const Appender& appender : reading.config.appenders) {
-        if (!meantAppender(reading, appender).empty()) continue;
+        if (!meantAppender(reading.config, appender).empty()) continue;
         checkComplaints(reading, appender, to);
         checkSize(reading, appender, to);
         checkBackups(reading, appender, to);

@@ -2,8 +2,8 @@
 
 #include <string>
 
-#include "findings/Findings.h"
+#include "Configuration.h"
 
-// The appender that an appender's name surely means: nobody uses this one, it has no file, and the
-// other one, which is used, is spelt nearly so. Empty when nothing is sure.
-std::string meantAppender(const Reading& reading, const Appender& appender);
+// The appender that an appender's name surely means: nobody uses this one, the other one is used
+// and spelt nearly so, and what is said of the two does not overlap. Empty when nothing is sure.
+std::string meantAppender(const Configuration& config, const Appender& appender);

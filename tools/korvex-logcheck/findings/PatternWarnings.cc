@@ -25,6 +25,9 @@ constexpr std::pair<std::string_view, std::string_view> kWords[] = {
     {"highlight", ""},    {"style", ""},
 };
 
+// Unknown ones that make a date within the braces of %d.
+constexpr std::string_view kDateLetters = "YyHIMSBbjTZ";
+
 // What unknown letters print elsewhere.
 const char* hintFor(char letter) {
     switch (letter) {
@@ -61,6 +64,7 @@ class PatternCheck {
         if (checkQuotes()) return;
         const std::vector<PatternPart> parts = partsOf(_pattern);
         const bool message = std::any_of(parts.begin(), parts.end(), isMessage);
+        checkDate(parts);
         for (std::size_t i = 0; i < parts.size(); ++i) {
             checkPart(parts[i], i + 1 < parts.size() ? &parts[i + 1] : nullptr, message);
         }
@@ -112,7 +116,7 @@ class PatternCheck {
         if (part.letter == ' ' && next != nullptr && isBlankBefore(*next)) {
             tellBlank(part);
         } else if (kConversionLetters.find(part.letter) == kConversionLetters.npos) {
-            checkUnknown(part, message);
+            if (!isOfDate(part)) checkUnknown(part, message);
         } else if (part.brace == PatternPart::kNone) {
             return;
         } else if (part.letter == 'd') {
@@ -186,6 +190,29 @@ class PatternCheck {
         return false;
     }
 
+    // "%Y-%m-%d %H:%M" without the "%d{" and the "}" around it is told once.
+    void checkDate(const std::vector<PatternPart>& parts) {
+        const auto isAmong = [](const PatternPart& part, std::string_view letters) {
+            return part.kind == PatternPart::CONVERSION &&
+                   letters.find(part.letter) != letters.npos;
+        };
+        const auto count = std::count_if(parts.begin(), parts.end(), [&](const PatternPart& part) {
+            return isAmong(part, kDateLetters);
+        });
+        const auto first = std::find_if(parts.begin(), parts.end(), [&](const PatternPart& part) {
+            return isAmong(part, "YyHIS");
+        });
+        if (count < 2 || first == parts.end()) return;
+        _date = true;
+        tell(_to, Code::PATTERN_UNKNOWN, piece(*first).place(),
+             "there is no conversion " + quoted(first->in(_pattern)) +
+                 ": it prints nothing; what is a date's stands in %d{...}");
+    }
+
+    bool isOfDate(const PatternPart& part) const {
+        return _date && kDateLetters.find(part.letter) != kDateLetters.npos;
+    }
+
     // Without a message, "%M" is its capital letter and no method.
     void checkUnknown(const PatternPart& part, bool message) {
         const bool capital = part.letter == 'M' && !message;
@@ -226,6 +253,7 @@ class PatternCheck {
     const std::string_view _pattern;
     Findings& _to;
     bool _messageTold = false;
+    bool _date = false;  // conversions of a date are told already
 };
 
 }  // namespace
