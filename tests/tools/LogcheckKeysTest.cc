@@ -342,6 +342,14 @@ TEST_F(LogcheckKeysTest, AnAppenderThatIsMisspelt) {
                     "4:1: warning: Appender \"main\" is used by nobody; did you mean "
                     "\"MAIN\"? [appender.unused]",
                     "5:1: warning: Appender \"MAINS\" is used by nobody [appender.unused]"));
+    EXPECT_THAT(findings("rootCategory=INFO,MAIN\nappender.MIAN.fileName=/a\n"
+                         "appender.MAIN.maxFileSize=4096\nappender.MAIN.maxBackupIndex=1\n"),
+                ElementsAre("2:1: warning: Appender \"MIAN\" is used by nobody; did you mean "
+                            "\"MAIN\"? [appender.unused]"));
+    EXPECT_THAT(findings("rootCategory=INFO,MAIN\nappender.MAINfileName=/a\n"
+                         "appender.MAIN.layout=SimpleLayout\n"),
+                ElementsAre("2:1: warning: Appender \"MAINfileName\" is used by nobody; did you "
+                            "mean \"MAIN\"? [appender.unused]"));
 }
 
 TEST_F(LogcheckKeysTest, AConfigurationThatOnlyWritesToStandardErrorCanBeClean) {
