@@ -210,6 +210,11 @@ TEST_F(LogcheckPatternsTest, ALayoutThatAsksForTooMuch) {
     EXPECT_THAT(findings(pattern + "%99999m 123456 100%%123456 %.9999999m%n\n"), IsEmpty());
 }
 
+// What is cut pads nothing.
+TEST_F(LogcheckPatternsTest, AWideConversionThatIsCut) {
+    EXPECT_THAT(told("%m%n%999999"), ElementsAre(testing::EndsWith("[pattern.cut]")));
+}
+
 TEST_F(LogcheckPatternsTest, DatesInTheJavaForm) {
     EXPECT_THAT(told("%d{HH:mm:ss,SSS} %d{h:mm a} %m%n"),
                 ElementsAre("4: warning: \"HH:mm:ss,SSS\" is printed as it stands: dates are "
