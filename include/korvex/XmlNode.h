@@ -2,9 +2,9 @@
 
 #include <korvex/Export.h>
 
-// XmlNode is the class of XML elements that this Korvex takes and hands out: xmlwrapp's xml::node,
-// or Korvex's own of that name where it was built without xmlwrapp. Which it is, a folder on the
-// include path tells.
+// XmlNode is the class of XML elements in the interface of Korvex: xml::node of xmlwrapp, or a
+// replacement of that name if Korvex was built without xmlwrapp. A folder on the include path
+// decides which.
 #if __has_include(<korvex-compat/XmlNode.h>)
 #include <korvex-compat/XmlNode.h>
 KORVEX_NAMESPACE(korvex) {
