@@ -46,10 +46,11 @@ struct PersistentFullData {
 // disturb a save of the parent.
 //
 // What it does not guarantee: a save rewrites the file in place, without fsync(2). A crash, a full
-// disk, or an exit(3) in another thread during a save leaves only the first part of the new content.
-// (A failed save does not change memory.) A value that put() replaces is never freed. A key that is
-// loaded ends at its first NUL byte. A record whose key begins with "_record-file-version", in upper
-// or lower case, is taken for the version of the file and is not loaded.
+// disk, or an exit(3) in another thread during a save leaves only the first part of the new
+// content. (A failed save does not change memory.) A value that put() replaces is never freed. A
+// key that is loaded ends at its first NUL byte. A record whose key begins with
+// "_record-file-version", in upper or lower case, is taken for the version of the file and is not
+// loaded.
 class RecordFileManager {
   public:
     // The one instance, built at the first call and never destroyed.
