@@ -104,6 +104,7 @@ class ScopedSaferFileDescriptor : public ScopedFileDescriptor {
     ~ScopedSaferFileDescriptor() = default;
 
     using ScopedFileDescriptor::operator=;
+    // As in the base class.
     ScopedSaferFileDescriptor& operator=(ScopedSaferFileDescriptor& other);
     ScopedSaferFileDescriptor& operator=(const ScopedSaferFileDescriptor&) = delete;
 };

@@ -27,8 +27,8 @@ class StringStore {
   public:
     // One record, copied out of the store.
     struct Record {
-        std::string key;
-        std::string value;
+        std::string key;    // without a NUL byte
+        std::string value;  // any bytes
     };
 
     // Names a file, which save() will write, and adds its records to those in memory. Without an
