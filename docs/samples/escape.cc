@@ -1,4 +1,4 @@
-// Logs what a stranger sent, so that it stays in one line and no terminal obeys it.
+// Logs untrusted text, so that it stays in one line and has no control characters.
 #include <korvex/util/Logger.h>
 
 #include <cstdio>
