@@ -28,7 +28,7 @@ class LogAppender {
     // An appender without descriptor, file, limits or layout.
     LogAppender();
     // An appender that writes to an open descriptor, which it neither owns nor closes, with a
-    // layout that must outlive it. A null layout means that of the root appender.
+    // layout that must outlive it; null: the root appender's.
     explicit LogAppender(FileDescriptor fd, const LogFormat* layout = nullptr);
     LogAppender(const LogAppender&) = delete;
     LogAppender& operator=(const LogAppender&) = delete;
@@ -78,9 +78,9 @@ class LogAppender {
     // has grown beyond its limit. Every five seconds of message time, checks by device and inode
     // whether the open file is still the one of that name; if not, closes it and opens a new one.
     // Failures, partly written lines included, are reported through LogFormat::internal when the
-    // lock is free. Such a message is lost, and the next one opens the file again. The part of a
-    // line that was written counts towards the limit. If the lock cannot be taken, writes without
-    // it. Throws what LogFormat::apply throws.
+    // lock is free. Such a message is lost, and the next one opens the file again. The part that
+    // was written of such a line counts towards the limit. Takes no notice of a lock that fails.
+    // Throws what LogFormat::apply throws.
     void write(const LogMsgMetadata& mdata, const std::string& msg);
 
   private:
@@ -89,7 +89,7 @@ class LogAppender {
     friend class LogChannel;
     friend class LoggingLocks;
 
-    // As write(). Returns whether all of the line was written.
+    // write(), and whether all of the line was written.
     bool tryWrite(const LogMsgMetadata& mdata, const std::string& msg);
     bool writeLine(const std::string& line, long long now, Report& report) KORVEX_REQUIRES(_mutex);
     void checkIdentity(long long now) KORVEX_REQUIRES(_mutex);
@@ -99,7 +99,7 @@ class LogAppender {
     void closeFd() KORVEX_REQUIRES(_mutex);
     void filenameWithSuffix(Pathname& out, unsigned suffix) const;
 
-    Mutex _mutex;  // held from the identity check to the rotation
+    Mutex _mutex;  // from the identity check to the rotation
     FileDescriptor _fd KORVEX_GUARDED_BY(_mutex);
     Pathname _filename;                 // empty: no file, only the descriptor
     std::int64_t _maxSize = 0;          // bytes; 0: never rotate
@@ -112,7 +112,7 @@ class LogAppender {
     dev_t _device KORVEX_GUARDED_BY(_mutex) = 0;
     // Seconds: when that identity was confirmed.
     long long _lastCheck KORVEX_GUARDED_BY(_mutex) = 0;
-    // Whether write() holds the lock now: a hint for threads that are about to wait for it.
+    // Whether write() holds the lock just now: a hint to those about to wait for it.
     std::atomic<bool> _writing{false};
     bool _registered = false;  // made by find(), so the lock is taken before a fork
 };
