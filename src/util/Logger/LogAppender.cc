@@ -10,9 +10,11 @@ inline namespace korvex {
 LogAppender::LogAppender() : LogAppender(FileDescriptor()) {}
 
 LogAppender::LogAppender(FileDescriptor fd, const LogFormat* layout)
-    : _fmt(layout), _output(std::make_unique<Output>(*this, fd)) {}
+    : _fmt(layout), _output(new Output(*this, fd)) {}
 
-LogAppender::~LogAppender() noexcept = default;
+LogAppender::~LogAppender() noexcept {
+    delete _output;
+}
 
 // The root appender stays what it is, whatever file name it was given.
 bool LogAppender::writesToFile() const {

@@ -6,7 +6,6 @@
 #include <korvex/util/Pathname.h>
 
 #include <cstdint>
-#include <memory>
 #include <string>
 #include <vector>
 
@@ -92,12 +91,12 @@ class LogAppender {
     // write(), and whether all of the line was written.
     bool tryWrite(const LogMsgMetadata& mdata, const std::string& msg);
 
-    Pathname _filename;                     // empty: no file, only the descriptor
-    std::int64_t _maxSize = 0;              // bytes; 0: never rotate
-    std::uint32_t _maxBackupIndex = 0;      // number of backups kept
-    const LogFormat* _fmt = nullptr;        // not owned; layouts are shared and never freed
-    bool _registered = false;               // made by find(), so the lock is taken before a fork
-    const std::unique_ptr<Output> _output;  // the descriptor, and who may write to it
+    Pathname _filename;                 // empty: no file, only the descriptor
+    std::int64_t _maxSize = 0;          // bytes; 0: never rotate
+    std::uint32_t _maxBackupIndex = 0;  // number of backups kept
+    const LogFormat* _fmt = nullptr;    // not owned; layouts are shared and never freed
+    bool _registered = false;           // made by find(), so the lock is taken before a fork
+    Output* const _output;              // owned: the descriptor, and who may write to it
 };
 
 }  // KORVEX_NAMESPACE(korvex)
