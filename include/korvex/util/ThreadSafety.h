@@ -15,11 +15,16 @@
 // A variable that is touched only while the lock is held, and a function that is called so.
 #define KORVEX_GUARDED_BY(lock) KORVEX_THREAD_SAFETY(guarded_by(lock))
 #define KORVEX_REQUIRES(...) KORVEX_THREAD_SAFETY(requires_capability(__VA_ARGS__))
+#define KORVEX_REQUIRES_SHARED(...) KORVEX_THREAD_SAFETY(requires_shared_capability(__VA_ARGS__))
 // A function that is called while the lock is not held, because it takes it itself.
 #define KORVEX_EXCLUDES(...) KORVEX_THREAD_SAFETY(locks_excluded(__VA_ARGS__))
 // What takes and what frees a lock.
 #define KORVEX_ACQUIRE(...) KORVEX_THREAD_SAFETY(acquire_capability(__VA_ARGS__))
 #define KORVEX_TRY_ACQUIRE(...) KORVEX_THREAD_SAFETY(try_acquire_capability(__VA_ARGS__))
 #define KORVEX_RELEASE(...) KORVEX_THREAD_SAFETY(release_capability(__VA_ARGS__))
+// The same where several threads may hold it together.
+#define KORVEX_TRY_ACQUIRE_SHARED(...) \
+    KORVEX_THREAD_SAFETY(try_acquire_shared_capability(__VA_ARGS__))
+#define KORVEX_RELEASE_SHARED(...) KORVEX_THREAD_SAFETY(release_shared_capability(__VA_ARGS__))
 // A function that the analysis cannot follow; a comment beside it says why it is right.
 #define KORVEX_NO_THREAD_SAFETY_ANALYSIS KORVEX_THREAD_SAFETY(no_thread_safety_analysis)

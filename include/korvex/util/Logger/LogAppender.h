@@ -4,11 +4,7 @@
 #include <korvex/util/FileDescriptor.h>
 #include <korvex/util/Logger/LogLevel.h>
 #include <korvex/util/Pathname.h>
-#include <korvex/util/ThreadObj.h>
 
-#include <sys/types.h>
-
-#include <atomic>
 #include <cstdint>
 #include <string>
 #include <vector>
@@ -25,10 +21,10 @@ class LogMsgMetadata;
 // log.
 class LogAppender {
   public:
-    // An appender without descriptor, file, limits or layout.
+    // An appender without descriptor, file, limits or layout. Throws std::bad_alloc.
     LogAppender();
     // An appender that writes to an open descriptor, which it neither owns nor closes, with a
-    // layout that must outlive it; null: the root appender's.
+    // layout that must outlive it; null: the root appender's. Throws std::bad_alloc.
     explicit LogAppender(FileDescriptor fd, const LogFormat* layout = nullptr);
     LogAppender(const LogAppender&) = delete;
     LogAppender& operator=(const LogAppender&) = delete;
@@ -81,9 +77,13 @@ class LogAppender {
     // lock is free. Such a message is lost, and the next one opens the file again. The part that
     // was written of such a line counts towards the limit. Takes no notice of a lock that fails.
     // Throws what LogFormat::apply throws.
+    //
+    // Threads write to a regular file at the same time; the kernel puts their lines one behind the
+    // other. The line that passes the limit is the last one of its file.
     void write(const LogMsgMetadata& mdata, const std::string& msg);
 
   private:
+    class Output;
     class Report;
 
     friend class LogChannel;
@@ -91,30 +91,13 @@ class LogAppender {
 
     // write(), and whether all of the line was written.
     bool tryWrite(const LogMsgMetadata& mdata, const std::string& msg);
-    bool writeLine(const std::string& line, long long now, Report& report) KORVEX_REQUIRES(_mutex);
-    void checkIdentity(long long now) KORVEX_REQUIRES(_mutex);
-    bool openFile(Report& report) KORVEX_REQUIRES(_mutex);
-    bool openAndInitFile(long long now, Report& report) KORVEX_REQUIRES(_mutex);
-    void rotateFile(long long now, Report& report) KORVEX_REQUIRES(_mutex);
-    void closeFd() KORVEX_REQUIRES(_mutex);
-    void filenameWithSuffix(Pathname& out, unsigned suffix) const;
 
-    Mutex _mutex;  // from the identity check to the rotation
-    FileDescriptor _fd KORVEX_GUARDED_BY(_mutex);
     Pathname _filename;                 // empty: no file, only the descriptor
     std::int64_t _maxSize = 0;          // bytes; 0: never rotate
     std::uint32_t _maxBackupIndex = 0;  // number of backups kept
     const LogFormat* _fmt = nullptr;    // not owned; layouts are shared and never freed
-    // Bytes in the file, as far as known.
-    std::int64_t _curSize KORVEX_GUARDED_BY(_mutex) = 0;
-    // Identity of the open file: an inode number alone is unique on one device only.
-    ino_t _inodeNum KORVEX_GUARDED_BY(_mutex) = 0;
-    dev_t _device KORVEX_GUARDED_BY(_mutex) = 0;
-    // Seconds: when that identity was confirmed.
-    long long _lastCheck KORVEX_GUARDED_BY(_mutex) = 0;
-    // Whether write() holds the lock just now: a hint to those about to wait for it.
-    std::atomic<bool> _writing{false};
-    bool _registered = false;  // made by find(), so the lock is taken before a fork
+    bool _registered = false;           // made by find(), so the lock is taken before a fork
+    Output* const _output;              // owned: the descriptor, and who may write to it
 };
 
 }  // KORVEX_NAMESPACE(korvex)
