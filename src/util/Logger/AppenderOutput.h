@@ -15,24 +15,25 @@
 
 inline namespace korvex {
 
-// What an appender writes to: its file, or a descriptor that was handed in.
+// What an appender writes to: its file, or a descriptor that was given to it.
 //
-// The kernel keeps the writers of a regular file in order, and better than a lock of ours could: it
-// spins while the file's owner runs. So, as long as nothing but writing is to be done, each thread
-// writes for itself, inside the gate. Whoever opens, rotates, looks at the file's identity, meets
-// an error or forks has the output alone: it holds the mutex, and the gate is shut. The gate is
-// open only while a regular file is, so everything else is written under the mutex.
+// The kernel keeps the writers of a regular file in order. It does that faster than a lock here
+// could, because it spins while the owner of the file's lock runs. So a thread that only writes is
+// inside the gate, together with other threads. A thread that opens or rotates the file, checks its
+// identity, handles an error, or forks has the output alone: it holds the mutex, and the gate is
+// shut. The gate is open only while a regular file is open. Everything else is written under the
+// mutex.
 //
-// A writer reserves its bytes before it writes, and comes in only while those reserved so far are
-// within the limit. So one line at most passes the limit, and all lines after it wait until the
-// file has been rotated: by its writer, or by the first of them that gets the mutex.
+// A writer reserves its bytes before it writes. It may enter only if the bytes reserved so far are
+// within the limit. So at most one line passes the limit. All later lines wait until the file was
+// rotated: by the writer of that line, or by the first waiting thread that gets the mutex.
 class KORVEX_HIDDEN LogAppender::Output {
   public:
     Output(const LogAppender& appender, FileDescriptor fd);
-    // Nobody else may know it any more.
+    // No other thread may use it any more.
     ~Output();
 
-    // Whether all of the line was written. Failures go into the report. `now`: seconds.
+    // Returns whether all of the line was written. Adds failures to the report. `now` is in seconds.
     bool write(const std::string& line, long long now, Report& report);
 
     // These three belong to start-up, before other threads log, and take no lock.
@@ -40,7 +41,7 @@ class KORVEX_HIDDEN LogAppender::Output {
     void replace(FileDescriptor fd);  // closes the file in use
     void testOpen(Report& report);
 
-    // Around a fork: nobody is inside meanwhile.
+    // For use around a fork: no thread is inside meanwhile.
     void hold();
     void release();
 
@@ -76,15 +77,15 @@ class KORVEX_HIDDEN LogAppender::Output {
     dev_t _device KORVEX_GUARDED_BY(_gate) = 0;
     // Seconds: when that identity was confirmed.
     long long _lastCheck KORVEX_GUARDED_BY(_gate) = 0;
-    // Somebody's line has passed the limit.
+    // Whether a line has passed the limit.
     std::atomic<bool> _rotationIsDue{false};
-    // Whether somebody writes alone just now: a hint to those about to wait for it.
+    // Whether a thread has the output alone: a hint for threads that are about to wait for it.
     std::atomic<bool> _writing{false};
     Mutex _mutex;
 
-    // Each writer changes these two; what they only read lies apart, before the mutex.
+    // Each writer changes these two. What writers only read is kept apart, before the mutex.
     WriterGate _gate;
-    // Bytes in the file and those reserved, as far as known; kept only where there is a limit.
+    // Bytes in the file and reserved bytes, as far as known. Maintained only if there is a limit.
     std::atomic<std::int64_t> _size{0};
 };
 

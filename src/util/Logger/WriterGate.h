@@ -8,15 +8,14 @@
 
 inline namespace korvex {
 
-// Lets any number of writers in together, and shuts them out for whoever needs the file to itself.
+// Lets any number of writers in together, and shuts them out if a thread needs the file alone.
 //
-// One word holds how many are inside and whether the gate is shut. What keeps it right:
-// - Nobody comes in while it is shut, and who is turned away has changed nothing.
-// - shut() returns when nobody is inside. From then on until open(), other threads only read the
-//   word. So a child that is forked meanwhile finds it as if its other threads had never been.
-// - Who leaves while it is shut does so under _mutex, and shut() waits under it: so that mutex,
-// too,
-//   is free and nobody's when shut() has returned.
+// One word holds the number of writers inside, and whether the gate is shut. The rules:
+// - While it is shut, no thread enters. A thread that is turned away has changed nothing.
+// - shut() returns when no thread is inside. From then on until open(), other threads only read
+//   the word. So a child that is forked meanwhile finds it as if it had no other threads.
+// - A thread that leaves while it is shut does so under _mutex, and shut() waits under it. So that
+//   mutex, too, is free when shut() has returned.
 class KORVEX_CAPABILITY("gate") WriterGate {
   public:
     // Shut at first.
@@ -46,13 +45,13 @@ class KORVEX_CAPABILITY("gate") WriterGate {
         leaveShut();
     }
 
-    // Waits, asleep, until nobody is inside. For one thread at a time, which is not inside; no harm
-    // when it is shut already.
+    // Shuts the gate, and sleeps until no thread is inside. For one thread at a time, which is not
+    // inside. Does nothing if it is already shut.
     void shut() noexcept KORVEX_ACQUIRE();
-    // By the thread that shut it, or its copy in the child of a fork.
+    // Called by the thread that shut it, or by its copy in the child of a fork.
     void open() noexcept KORVEX_RELEASE() { _word.store(0, std::memory_order_release); }
 
-    // Is inside for a scope, if the gate lets it in.
+    // Enters for a scope, if the gate is open.
     class Visit;
 
   private:

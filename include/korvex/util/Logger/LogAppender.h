@@ -75,11 +75,11 @@ class LogAppender {
     // whether the open file is still the one of that name; if not, closes it and opens a new one.
     // Failures, partly written lines included, are reported through LogFormat::internal when the
     // lock is free. Such a message is lost, and the next one opens the file again. The part that
-    // was written of such a line counts towards the limit. Takes no notice of a lock that fails.
-    // Throws what LogFormat::apply throws.
+    // was written of such a line counts towards the limit. If a lock cannot be taken, it writes
+    // without it. Throws what LogFormat::apply throws.
     //
-    // Threads write to a regular file at the same time; the kernel puts their lines one behind the
-    // other. The line that passes the limit is the last one of its file.
+    // Several threads may write to a regular file at the same time; the kernel puts their lines in
+    // order. The line that passes the limit is the last one of its file.
     void write(const LogMsgMetadata& mdata, const std::string& msg);
 
   private:
