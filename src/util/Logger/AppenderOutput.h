@@ -33,7 +33,7 @@ class KORVEX_HIDDEN LogAppender::Output {
     // No other thread may use it any more.
     ~Output();
 
-    // Returns whether all of the line was written. Adds failures to the report. `now` is in seconds.
+    // Returns whether all of the line was written. Adds failures to the report. `now`: seconds.
     bool write(const std::string& line, long long now, Report& report);
 
     // These three belong to start-up, before other threads log, and take no lock.
