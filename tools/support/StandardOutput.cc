@@ -17,6 +17,7 @@ namespace {
 }  // namespace
 
 void writeOutput(std::string_view bytes) {
+    if (bytes.empty()) return;  // it may be of no array at all
     if (std::fwrite(bytes.data(), 1, bytes.size(), stdout) != bytes.size()) lost();
 }
 
