@@ -1,7 +1,7 @@
 #!/bin/sh
 # Runs the tests with real log engines and servers, and says what it skipped, and why.
 # Usage: engines.sh BUILD-DIR ENGINES-DIR [MODULE...]
-# KORVEX_MESSAGES says how many messages are logged for each layout (100000).
+# KORVEX_MESSAGES says how many messages are logged for each layout (100000; 5000 at least).
 set -eu
 build=$(realpath "$1")
 cd "$(dirname "$0")/.."

@@ -4,14 +4,13 @@ import base64
 import glob
 import json
 import os
-import pwd
 import shutil
 import subprocess
 import sys
-import time
 import unittest
 
-from harness import BUILD, PATH, SOURCE, EngineTest, environment, eventually, free_port, lines_of, program
+from harness import (BUILD, SOURCE, EngineTest, environment, eventually, free_port, lines_of,
+                     program)
 
 RECORDS = os.path.join(BUILD, "tools/korvex-records/korvex-records")
 SCRIPT = os.path.join(SOURCE, "examples/fleet/records.py")
