@@ -9,7 +9,7 @@ page() {
     awk '
     # A code span as HTML, where Doxygen leaves out less once each mark is quoted.
     function span(text) {
-        if (text !~ /%[A-Za-z]|  /) return "`" text "`"
+        if (text !~ /%[A-Za-z]|  |\047/) return "`" text "`"
         gsub(/[\\@<>%#&$*_]/, "\\\\&", text)
         gsub(/--/, "\\--", text)
         gsub(/  /, "\\&nbsp;\\&nbsp;", text)
@@ -17,10 +17,15 @@ page() {
     }
     function spans(line,    out) {
         while (match(line, /`[^`]+`/)) {
-            out = out substr(line, 1, RSTART - 1) span(substr(line, RSTART + 1, RLENGTH - 2))
+            out = out plain(substr(line, 1, RSTART - 1)) span(substr(line, RSTART + 1, RLENGTH - 2))
             line = substr(line, RSTART + RLENGTH)
         }
-        return out line
+        return out plain(line)
+    }
+    # A backslash in text is no command.
+    function plain(text) {
+        gsub(/\\/, "&&", text)
+        return text
     }
     /^<!-- .* -->$/ { next }
     /^```/ { code = !code }

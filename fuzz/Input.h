@@ -18,6 +18,10 @@ class Input {
         _rest.erase(0, n);
         return value;
     }
+    // The same, below the limit.
+    std::size_t below(std::size_t limit, std::size_t n) {
+        return static_cast<std::size_t>(number(n) % limit);
+    }
     // What comes before the next newline, without it.
     std::string line() {
         const std::size_t end = _rest.find('\n');

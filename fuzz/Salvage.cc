@@ -16,7 +16,7 @@ using Records = std::map<std::string, std::string>;
 
 // Text, so that no bytes of it pass for a length: a record within a value could be told from none.
 std::string text(Input& input, std::size_t most) {
-    std::string field(input.number(1) % most, 'a');
+    std::string field(input.below(most, 1), 'a');
     for (char& c : field)
         c = static_cast<char>(' ' + input.number(1) % 95);
     return field;
@@ -46,8 +46,8 @@ struct Damage {
 Damage damaged(std::string bytes, Input& input) {
     Damage damage;
     const std::uint64_t how = input.number(1) % 4;
-    damage.begin = input.number(2) % (bytes.size() + 1);
-    const std::size_t length = std::min<std::size_t>(input.number(1), bytes.size() - damage.begin);
+    damage.begin = input.below(bytes.size() + 1, 2);
+    const std::size_t length = std::min(input.below(256, 1), bytes.size() - damage.begin);
     damage.end = damage.begin + length;
     if (how == 0) {  // cut
         bytes.resize(damage.begin);

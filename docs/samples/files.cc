@@ -1,4 +1,4 @@
-// Files and descriptors: nothing throws, nothing logs; the result and errno tell.
+// Files and descriptors. Nothing throws or logs: check the result and errno.
 #include <korvex/util/FileDescriptor.h>
 
 #include <cerrno>

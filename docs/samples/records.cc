@@ -16,7 +16,7 @@ int main(int argc, char** argv, char** envp) {
     store.init(xml::node());
 
     put("fruit/apple", "red", false);        // in memory only
-    put("fruit/pear", "", false);            // a value of no bytes is a value
+    put("fruit/pear", "", false);            // a value may be empty
     put("vegetable/leek", "green", true);    // saves all three
     put("_record-file-version", "9", true);  // refused
 

@@ -9,7 +9,7 @@ int main(int argc, char** argv, char** envp) {
     StringStore store = StringStore::open();  // reads $KORVEX_DB/hashDb/data
 
     store.put("fruit/apple", "red");  // in memory only
-    store.put("fruit/pear", "");      // a value of no bytes is a value
+    store.put("fruit/pear", "");      // a value may be empty
     store.put("vegetable/leek", "green");
 
     std::printf("apple: %s\n", store.get("fruit/apple").value_or("none").c_str());

@@ -1,22 +1,23 @@
 #pragma once
 
-// Stands before a free function of a public header, as clang++ looks at the namespace around the
-// function's definition. The static library, whose users compile with KORVEX_STATIC, shows nothing:
-// a plugin that it is linked into does not show Korvex either.
+// Stands before each free function of a public header, because clang++ takes the visibility from
+// the namespace around the definition. Users of the static library compile with KORVEX_STATIC: it
+// exports nothing, so a plugin that it is linked into does not export Korvex either.
 #ifdef KORVEX_STATIC
 #define KORVEX_EXPORT
 #else
 #define KORVEX_EXPORT [[gnu::visibility("default")]]
 #endif
 
-// Stands before the name of a class that a public header declares but does not define: nobody else
-// links to it. The library is compiled so that whatever no public header declares is hidden anyway.
+// Stands before the name of a class that a public header declares but does not define. No other
+// code links to it. Everything that no public header declares is hidden anyway.
 #define KORVEX_HIDDEN [[gnu::visibility("hidden")]]
 
-// Opens the namespace in a public header: what stands in it is seen from outside a shared library.
-// Names can be written without "korvex::", unless a program defines KORVEX_QUALIFIED_NAMES before
-// the first header of Korvex because it has a Logger, Thread or ERROR of its own. The names in the
-// library are the same either way, so files compiled with it and without link together.
+// Opens the namespace in a public header; what is declared in it is exported from a shared library.
+// Names can be written without "korvex::", unless the program defines KORVEX_QUALIFIED_NAMES before
+// the first header of Korvex, because it has a Logger, Thread or ERROR of its own. The symbols in
+// the library are the same in both cases, so files compiled with and without the macro link
+// together.
 #ifdef KORVEX_QUALIFIED_NAMES
 #define KORVEX_NAMESPACE(name) namespace KORVEX_EXPORT name
 #else

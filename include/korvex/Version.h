@@ -1,7 +1,7 @@
 #pragma once
 
-// The version of these headers. CMakeLists.txt takes the project's from here. Within one major
-// version a program that compiles and links goes on doing so.
+// The version of these headers. CMakeLists.txt reads the version of the project from here. Within
+// one major version, a program that compiles and links keeps compiling and linking.
 #define KORVEX_VERSION_MAJOR 1
 #define KORVEX_VERSION_MINOR 0
 #define KORVEX_VERSION_PATCH 0

@@ -1,7 +1,7 @@
 # shellcheck shell=sh disable=SC2154  # dev's own variables
 # ./dev install; sourced by dev.
 
-# Sets prefix and shared from the word's arguments.
+# Sets prefix and shared from the arguments of the command.
 install_arguments() {
     prefix=/usr/local shared=OFF
     while [ $# -gt 0 ]; do

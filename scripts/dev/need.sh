@@ -1,7 +1,7 @@
 # shellcheck shell=sh disable=SC2154  # dev's own variables
 # What ./dev needs installed; sourced by it. Debian's names of packages, which are Ubuntu's too.
 
-# there PACKAGE: whether it is installed, by Debian's word or because what it holds is found.
+# there PACKAGE: whether it is installed, by dpkg or because its contents are found.
 there() {
     dpkg-query -W -f '${Status}\n' "$1" 2> /dev/null | grep -q 'ok installed' && return
     case $1 in

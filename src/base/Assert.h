@@ -10,6 +10,6 @@ inline namespace korvex {
 // For programming errors; always on. The condition's own text is what is printed.
 #define KORVEX_ASSERT(condition) KORVEX_ASSERT_AS(condition, #condition)
 
-// The same with the text given, where it differs from the code's way to say it.
+// The same with another text than that of the condition in the code.
 #define KORVEX_ASSERT_AS(condition, text) \
     ((condition) ? static_cast<void>(0) : ::korvex::assertionFailed(__FILE__, __LINE__, text))

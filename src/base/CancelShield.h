@@ -4,8 +4,8 @@
 
 inline namespace korvex {
 
-// Puts off pthread_cancel(3) of the calling thread for a scope that must not be left half done, or
-// that promises not to throw, as a cancellation does.
+// Defers pthread_cancel(3) of the calling thread for a scope that must be completed, or that must
+// not throw: a cancellation throws.
 class CancelShield {
   public:
     CancelShield() { pthread_setcancelstate(PTHREAD_CANCEL_DISABLE, &_before); }

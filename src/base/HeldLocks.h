@@ -2,12 +2,12 @@
 
 inline namespace korvex {
 
-// What the calling thread holds of the locks that a line of logging takes on its way. Plain values,
-// which need no construction and no destruction: they work in signal handlers, exit handlers and
-// ending threads.
+// Which of the locks that logging takes are held by the calling thread. Plain values, which need no
+// construction and no destruction, so they work in signal handlers, exit handlers and ending
+// threads.
 class HeldLocks {
   public:
-    // Stands for one such lock, from before it is waited for until after it is free.
+    // Marks one such lock as held: from before the thread waits for it until after it is free.
     class One {
       public:
         One() { ++_ones; }
@@ -16,11 +16,12 @@ class HeldLocks {
         ~One() { --_ones; }
     };
 
-    // Whether the thread is inside such a lock. Nothing logs there, so code that finds it so is a
-    // signal handler that interrupted logging, and must not wait for what its own thread holds.
+    // Whether the thread holds such a lock. Code under the locks does not log. So if this is true
+    // where a message is logged, a signal handler interrupted logging; it must not wait for its own
+    // thread.
     static bool any() { return _ones > 0; }
 
-    // Whether the thread holds all of them, for the length of a fork: it needs to take none then.
+    // Whether the thread holds all of them, during a fork. Then it needs to take none.
     static bool all() { return _all; }
     static void setAll(bool held) { _all = held; }
 

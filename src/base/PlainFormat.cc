@@ -35,7 +35,8 @@ char* putCharacter(char* to, char* end, char c) {
     return to + 1;
 }
 
-// The conversion whose percent sign `p` has just passed; also null when it is none of ours.
+// Writes the conversion after the percent sign that `p` has just passed. Also null if it is not one
+// of those that are supported here.
 char* convert(char* to, char* end, const char*& p, va_list* ap) {
     switch (*p++) {
         case 'd':

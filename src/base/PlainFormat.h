@@ -5,10 +5,10 @@
 
 inline namespace korvex {
 
-// Sets an empty `out` to what printf(3) makes of a format that holds no other conversions than %d
-// %i %u %ld %lu %s %c %x and %%, if that is at most 255 characters: most messages, at a third of
-// printf's price (a fifth of what a line to a file costs). False, and `out` untouched, for any
-// other; `ap` is not moved on. Throws std::bad_alloc.
+// Formats like printf(3) into an empty `out`, if the format has no other conversions than %d %i %u
+// %ld %lu %s %c %x and %%, and the result has at most 255 characters. That is enough for most
+// messages, and takes a third of printf's time (it saves a fifth of the cost of a line to a file).
+// Otherwise returns false, with `out` untouched. `ap` is not advanced. Throws std::bad_alloc.
 bool formatPlain(std::string& out, const char* fmt, va_list ap)
     __attribute__((format(printf, 2, 0)));
 

@@ -16,9 +16,9 @@ int formatInto(char* buf, std::size_t size, const char* fmt, va_list ap) {
 
 }  // namespace
 
-// C99's vsnprintf tells the length that is needed, so one retry is enough as long as no other
-// thread makes a text longer between the two; then it takes one more. A negative result is a
-// conversion that no buffer can cure.
+// C99's vsnprintf returns the length that is needed, so one retry is usually enough. If another
+// thread makes a text longer between the two calls, one more is needed. A negative result means
+// that a conversion failed; a larger buffer does not help.
 PrintfBuffer::PrintfBuffer(const char* fmt, va_list ap) {
     std::size_t size = sizeof _local;
     int length = formatInto(_local, size, fmt, ap);

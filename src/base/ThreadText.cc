@@ -23,8 +23,8 @@ bool ThreadText::makeKey() noexcept {
     return haveKey;
 }
 
-// A thread's key, not a thread_local object, tells when the thread ends: registering one of those
-// may end the process for want of memory.
+// A thread-specific key detects the end of the thread. A thread_local object would not do: to
+// register one may end the process if memory runs out.
 ThreadText::Texts* ThreadText::makeTexts() noexcept {
     if (_nothingKept) return nullptr;
     _nothingKept = true;  // until all has gone well

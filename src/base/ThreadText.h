@@ -5,11 +5,11 @@
 
 inline namespace korvex {
 
-// An empty text for the length of a scope whose memory the thread keeps for the next one, so that a
-// text no longer than its forerunners takes none from the heap (a tenth of what a line to a file
-// costs). Several may be in use at once, the last one built being the first to go: by logging
-// inside logging, or in a signal handler. Where nothing can be kept (no memory, too many at once, a
-// thread that is ending) it is a text like any other.
+// An empty text for a scope. The thread keeps its memory for the next one, so a text that is not
+// longer than earlier ones needs no memory from the heap (a tenth of the cost of a line to a file).
+// Several may be in use at once, by logging inside logging or in a signal handler; the last one
+// built is destroyed first. If no memory can be kept (out of memory, too many at once, a thread
+// that is ending), it is an ordinary text.
 class ThreadText {
   public:
     ThreadText() noexcept : _kept(take()) {}
@@ -21,7 +21,7 @@ class ThreadText {
 
     std::string& operator*() { return _kept != nullptr ? *_kept : _own; }
 
-    // Makes what all threads share, if it is not there yet.
+    // Creates what all threads share, unless it exists.
     static bool makeKey() noexcept;
 
   private:

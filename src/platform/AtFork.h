@@ -2,11 +2,11 @@
 
 #include <pthread.h>
 
-// Stand before a function that runs before every static initialiser of the program, there to
-// register the library's pthread_atfork(3) handlers. What is registered first is taken last before
-// a fork: so any handler of the program may take a lock of its own under which other threads log.
-// Among the library's own locks the one that is taken under others comes first: each has a number
-// of its own here, as the order of files is the linker's.
+// These attributes make a function run before all static initialisers of the program. The function
+// registers pthread_atfork(3) handlers of the library. Handlers that are registered first run last
+// before a fork. So a handler of the program may take a lock under which other threads log. Of the
+// library's own locks, one that is taken under others must be registered before them. Each has a
+// number here, because the linker decides the order of files.
 #define KORVEX_REGISTERS_LIBC_LOCK __attribute__((constructor(101)))
 #define KORVEX_REGISTERS_LOGGING_LOCKS __attribute__((constructor(102)))
 #define KORVEX_REGISTERS_THREAD_LOCKS __attribute__((constructor(103)))

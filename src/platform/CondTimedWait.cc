@@ -11,7 +11,7 @@ inline namespace korvex {
 
 namespace {
 
-// macOS waits for a length of time, glibc by a clock of choice, POSIX by the one that people set.
+// macOS takes a duration, glibc a time of a chosen clock, POSIX a time of the wall clock.
 #if defined(__APPLE__) || defined(KORVEX_HAS_CLOCKWAIT)
 constexpr clockid_t kClock = CLOCK_MONOTONIC;
 #else
@@ -19,7 +19,7 @@ constexpr clockid_t kClock = CLOCK_REALTIME;
 #endif
 
 #if defined(__APPLE__)
-// What is left of the time, zero when it is over.
+// The remaining time; zero when the time is over.
 struct timespec untilThen(const struct timespec& then) {
     struct timespec now {};
     clock_gettime(kClock, &now);
@@ -38,7 +38,7 @@ struct timespec untilThen(const struct timespec& then) {
 
 Deadline::Deadline(unsigned int seconds) {
     clock_gettime(kClock, &_moment);
-    // A time_t of 32 bits cannot hold every sum.
+    // A 32-bit time_t cannot hold every sum.
     const long long most = std::numeric_limits<time_t>::max();
     _moment.tv_sec = static_cast<time_t>(
         std::min(static_cast<long long>(_moment.tv_sec) + static_cast<long long>(seconds), most));

@@ -8,7 +8,7 @@
 
 inline namespace korvex {
 
-// A moment some seconds from now, by a clock that nobody sets where the platform can wait by one.
+// A time some seconds from now, by a monotonic clock if the platform can wait by one.
 class KORVEX_HIDDEN Deadline {
   public:
     explicit Deadline(unsigned int seconds);

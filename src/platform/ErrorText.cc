@@ -16,7 +16,7 @@ extern "C" int __xpg_strerror_r(int errnum, char* buf, size_t size);
 inline namespace korvex {
 
 bool errorText(int errnum, char* buf, std::size_t size) {
-    if (LibcLock::isInside()) return false;  // not even the C library could tell it there
+    if (LibcLock::isInside()) return false;  // the C library would wait for its own lock
     const LibcLock lock;
     return KORVEX_STRERROR_R(errnum, buf, size) == 0;
 }

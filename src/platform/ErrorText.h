@@ -4,8 +4,8 @@
 
 inline namespace korvex {
 
-// Stores the system's description of an error number, NUL-terminated, in buf. False when the
-// system knows no such number, and in a signal handler that interrupted its thread in here.
+// Stores the system's description of an error number, NUL-terminated, in buf. False if the system
+// has none, and in a signal handler that interrupted its thread in this function.
 bool errorText(int errnum, char* buf, std::size_t size);
 
 }  // namespace korvex

@@ -6,10 +6,10 @@ inline namespace korvex {
 
 namespace {
 
-// Needs no construction: static initialisers log.
+// Needs no construction, because static initialisers may log.
 pthread_mutex_t mutex = PTHREAD_MUTEX_INITIALIZER;
 
-// The forking thread's: a handler of somebody else's that runs between ours may log.
+// For the thread that forks: a handler of other code that runs between ours may log.
 thread_local bool heldForFork = false;
 
 void take() {

@@ -4,19 +4,19 @@
 
 inline namespace korvex {
 
-// Held, for a scope, around what the C library does under locks of its own that a child of fork(2)
-// would inherit held and could never free: local time, and the texts of error numbers. A fork waits
-// until no thread is there. Code that is not ours and calls the same functions can still leave such
-// a child waiting; nothing here can help that.
+// Held, for a scope, around calls of the C library that take its own locks: local time, and the
+// texts of error numbers. A child of fork(2) would inherit such a lock locked, and could never
+// unlock it. So a fork waits until no thread is in such a scope. If other code calls the same
+// functions, a child may still wait for ever; that cannot be prevented here.
 class LibcLock {
   public:
-    // Never fails: where the lock cannot be had, the C library's own must do.
+    // Never fails: if the lock cannot be taken, only the C library's own lock protects the call.
     LibcLock() noexcept;
     LibcLock(const LibcLock&) = delete;
     LibcLock& operator=(const LibcLock&) = delete;
     ~LibcLock();
 
-    // Whether the calling thread is in such a scope, and so who asks a signal handler that
+    // Whether the calling thread is in such a scope. Then the caller is a signal handler that
     // interrupted it.
     static bool isInside() { return _inside; }
 

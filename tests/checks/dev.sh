@@ -63,7 +63,7 @@ for word in $called; do
     prints "  $word	"
 done
 dev 2 tset
-says "there is no word 'tset'"
+says "there is no command 'tset'"
 says "  test	"
 called_no '^(apt-get|sudo|cmake|ctest)'
 dev 0 test --help

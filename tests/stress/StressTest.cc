@@ -3,6 +3,7 @@
 #include <korvex/util/Thread.h>
 
 #include <gmock/gmock.h>
+#include <unistd.h>
 
 #include <algorithm>
 #include <atomic>
@@ -25,6 +26,7 @@ namespace {
 
 using testsupport::ChildResult;
 using testsupport::linesOf;
+using testsupport::readFile;
 using testsupport::runInChild;
 using testsupport::TempDir;
 using testsupport::testScale;
@@ -186,6 +188,31 @@ TEST_F(LoggingStress, NoLineIsLostOrDoubledWhileLevelsChangeAndFilesRotate) {
         return line.find("perhaps") != std::string::npos;
     });
     EXPECT_EQ(all.size(), kThreads * _each * 2 + static_cast<std::size_t>(debug));
+}
+
+// However many write at once: the line that passes the limit is the last one of its file.
+TEST_F(LoggingStress, OneLineAtMostPassesTheLimitOfAFile) {
+    const std::size_t limit = 2000;
+    expectToEndWell([&] {
+        initialize();
+        Logger logger("test");
+        together([&](unsigned t) {
+            for (unsigned n = 0; n < _each; ++n)
+                logger.info("%u %.*s", t, static_cast<int>(n % 60), std::string(60, 'x').c_str());
+        });
+        return 0;
+    });
+    unsigned backups = 0;
+    for (;; ++backups) {
+        const std::string file = _dir.file("A." + std::to_string(backups + 1));
+        if (access(file.c_str(), F_OK) != 0) break;
+        const std::string text = readFile(file);
+        const std::size_t lastLine = text.rfind('\n', text.size() - 2) + 1;
+        EXPECT_GT(text.size(), limit) << file;
+        EXPECT_LE(lastLine, limit) << file;
+    }
+    EXPECT_GT(backups, 10u);
+    EXPECT_LE(readFile(_dir.file("A")).size(), limit);
 }
 
 TEST_F(LoggingStress, ThreadsMayLogWhileTheProcessExits) {

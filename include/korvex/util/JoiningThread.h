@@ -7,24 +7,24 @@
 
 KORVEX_NAMESPACE(korvex) {
 
-// A thread made of a callable. It runs at once, and is joined when this object goes:
+// A thread made of a callable. It starts at once, and is joined when this object is destroyed:
 //
 //     Thread mainThread;                                 // once, before any other
 //     JoiningThread worker("worker", [&] { count(); });  // runs
 //     worker.join();                                     // or at the end of the scope
 //
-// As with Thread, an exception that leaves the callable ends the process, and the calls below
-// belong to one thread. After fork(2) the child must not destroy the parent's objects.
+// As with Thread, an exception that leaves the callable ends the process. Only one thread may make
+// the calls below. After fork(2) the child must not destroy the parent's objects.
 template <class Body>
 class JoiningThread {
   public:
-    // The name is not copied and must outlive the thread. `body`, which is called without
-    // arguments, is kept until this object goes. Throws what Thread's constructor throws, and what
+    // The name is not copied and must outlive the thread. `body` is called without arguments, and
+    // is kept until this object is destroyed. Throws what Thread's constructor throws, and what
     // moving `body` throws.
     JoiningThread(const char* name, Body body) : _worker(name, std::move(body)) { _worker.go(); }
     JoiningThread(const JoiningThread&) = delete;
     JoiningThread& operator=(const JoiningThread&) = delete;
-    // Waits for the end of the thread, if join() has not. Throws what Thread::join throws.
+    // Calls join() unless it was called before. Throws what Thread::join throws.
     ~JoiningThread() noexcept(false) {
         if (!_joined) join();
     }

@@ -14,8 +14,8 @@
 KORVEX_NAMESPACE(korvex) {
 
 // How the process was started: its directories (from the environment), its options (from the
-// command line, by popt), its id and start time. Everybody asks the one instance; the main thread
-// fills it in before other threads exist, and then it is only read. No locks.
+// command line, by popt), its id and start time. There is one instance for the process. The main
+// thread fills it in before other threads exist; afterwards it is only read. It has no locks.
 class LoaderInfo {
   public:
     // The one instance, built at the first call and never destroyed. Throws std::bad_alloc.
@@ -23,23 +23,23 @@ class LoaderInfo {
 
     // Everything empty, false or 0.
     LoaderInfo();
-    // Copies neither getKorvexDb() nor getStartupMode(), which stay as they are (empty in a new
-    // copy), nor anything of the command line's parsing.
+    // Copies everything except getKorvexDb(), getStartupMode(), and the state of the command-line
+    // parser. These stay as they are in the target (empty in a new copy).
     LoaderInfo(const LoaderInfo& other);
     LoaderInfo& operator=(const LoaderInfo& other);
     ~LoaderInfo();
 
-    // Compares all but the node and the parsing; so a copy differs from a record that has a
-    // database directory or a start-up mode.
+    // Compares everything except the node and the state of the parser. So a copy is not equal to
+    // its source if the source has a database directory or a start-up mode.
     bool operator==(const LoaderInfo& other) const;
 
     // Sets the defaults ("korvexd", "etc", "myinstall", port 8089, debug and daemon true, debug
-    // log false), the process id and the start time, and prepares the parsing of the command line,
-    // which is copied. Leaves the two directories, the host and the start-up mode alone. May be
-    // called again. Throws std::bad_alloc.
+    // log false), the process id and the start time. Copies the command line and prepares its
+    // parsing. Leaves the two directories, the host and the start-up mode unchanged. May be called
+    // again. Throws std::bad_alloc.
     void init(int argc, const char* const* argv);
-    // KORVEX_HOME and KORVEX_DB, where set, without doubled and trailing separators; a value that
-    // was untidy is written back to the environment.
+    // Takes KORVEX_HOME and KORVEX_DB where they are set. Repeated and trailing separators are
+    // removed; if that changed a value, it is also written back to the environment.
     void populateFromEnvironment();
     // Parses the command line prepared by init():
     //
@@ -48,19 +48,19 @@ class LoaderInfo {
     //     --debug      getUseDebugLog() is true; without it, false
     //     -c PATH, -h HOST, -i INSTALL, -n COMPONENT, -p PORT, --mode MODE
     //
-    // An unknown option is told on standard error and sets isError(); popt's other complaints are
-    // passed over. --help and --usage print popt's help and end the process with status 0.
-    // Nothing before init().
+    // An unknown option is reported on standard error and sets isError(). Other errors of popt are
+    // ignored. --help and --usage print popt's help and end the process with status 0. Does nothing
+    // before init().
     void populateFromCommandLine();
-    // Writes popt's help to standard error. Nothing before init().
+    // Writes popt's help to standard error. Does nothing before init().
     void printHelp();
 
-    // Whether the record can be used: 0, or the negative code of the first failure. Looks at the
-    // file system, changes nothing.
+    // Checks whether this start-up information can be used: 0, or the negative code of the first
+    // failure. Reads the file system, changes nothing.
     int validate() const;
-    // The message of a code of validate(); "" for any other. The text lives for ever.
+    // The message for a code of validate(); "" for any other. The text is never freed.
     static const char* getErrorMessage(int code);
-    // Whether an unknown option was met since init().
+    // Whether there was an unknown option since init().
     bool isError() const { return _optionsError; }
 
     Pathname getKorvexHome() const { return _korvexHome; }           // installation home
@@ -76,20 +76,21 @@ class LoaderInfo {
     bool getDaemon() const { return _isDaemon; }            // run as a daemon
     bool getUseDebugLog() const { return _useDebugLog; }  // start with the debug log configuration
 
-    // The component's configuration node; the reference is to the record's own.
+    // The configuration node of the component, by reference.
     const XmlNode& getCommonComponentNode() const { return _commonComponentNode; }
     XmlNode& getCommonComponentNode() { return _commonComponentNode; }
     // Stores a copy.
     void setCommonComponentNode(const XmlNode& node);
 
-    // The configuration directory (home and "etc"), and that of this installation below it.
+    // The configuration directory ("etc" below the home, or what -c names), and that of this
+    // installation below it.
     Pathname getCommonConfigPath() const;
     Pathname getInstallConfigPath() const;
 
-    // The first call of a command-line tool's main: init(), populateFromEnvironment(), and logging
-    // by etc/log-cmdline.cfg below the home, whose path it prints on standard output. Without a
-    // home it says so there and ends the process with status 255. Neither parses the command line
-    // nor validates. `envp` is not used.
+    // The first call in main() of a command-line tool. Calls init() and populateFromEnvironment(),
+    // and initialises logging by etc/log-cmdline.cfg below the home. Prints the path of that file
+    // on standard output. If there is no home, prints a message there and ends the process with
+    // status 255. Neither parses the command line nor validates. `envp` is not used.
     static void common_main_setup(int argc, const char* const* argv, const char* const* envp);
 
   private:

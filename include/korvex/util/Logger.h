@@ -1,6 +1,6 @@
 #pragma once
 
-// The front door of logging: this one include gives all of it.
+// Includes all of logging.
 #include <korvex/Export.h>
 #include <korvex/util/Logger/LogAppender.h>
 #include <korvex/util/Logger/LogChannel.h>
@@ -19,38 +19,39 @@
 
 KORVEX_NAMESPACE(korvex) {
 
-// A module's voice: a named front end, usually a file-level static, that writes to the channel of
-// the same name. Cheap to build and to copy.
+// A named logger, usually a static object of one source file. It writes to the channel of the same
+// name. Cheap to build and to copy.
 //
 //     static Logger logger("net");
 //     logger.warn("%s: lost after %d bytes: %m", peer, count);
 //
-// Works at any time. Before Logger::initialize, messages of INFO and above go to standard error as
-// they are; through a logger that is not even constructed (another file's static) every message
-// goes there behind its level's name. Static destructors, exit handlers and threads that outlive
-// main may log too.
+// Works at any time. Before Logger::initialize, messages of level INFO and above go to standard
+// error, without a layout. A logger whose constructor has not run yet (a static object of another
+// source file) writes every message to standard error as "LEVEL - text". Static destructors, exit
+// handlers and threads that outlive main may log too.
 //
-// A child of fork(2) may log whatever the parent's other threads were doing (but not fork in a
-// signal handler that interrupted logging: the handler would wait for itself).
+// A child of fork(2) may log, whatever the parent's other threads did at the fork. Do not fork in a
+// signal handler that interrupted logging: the handler would wait for itself.
 //
 // The level methods never throw, leave errno as it was and may be called from any thread. Their
-// printf forms take printf(3)'s conversions and %m, the text of the errno at the call. (g++
-// -Wpedantic calls a literal %m no ISO C++; __extension__ before the call silences just that.) A
-// format whose conversion fails is logged unconverted.
+// printf forms take the conversions of printf(3), and %m for the text of errno at the call. (g++
+// -Wpedantic warns that %m in a literal is not part of ISO C++; __extension__ before the call
+// silences that warning.) If a conversion fails, the format itself is logged.
 class Logger {
   public:
-    // `name` is neither copied nor owned: it must outlive the logger and its copies. Once logging
-    // is initialised, binds to the channel of that name, or to the root channel when there is no
-    // such channel yet; before that, waits for initialize(). Throws std::bad_alloc.
+    // `name` is neither copied nor owned: it must outlive the logger and its copies. After
+    // initialize(), the logger is bound at once to the channel of that name, or to the root channel
+    // if there is no such channel yet. Before, initialize() binds it. Throws std::bad_alloc.
     explicit Logger(const char* name);
-    // A copy has the same name and channel. A copy made before initialize() is not on the list of
-    // loggers waiting for it: until then its messages go to standard error behind their level's
-    // name, after that to the root channel.
+    // A copy has the same name and channel. A copy that is made before initialize() is not bound by
+    // it: its messages go to standard error as "LEVEL - text" before, and to the root channel
+    // afterwards.
     Logger(const Logger& other);
     Logger& operator=(const Logger& other);
     ~Logger();
 
-    // Format as printf(3) does, with %m, and only when the level passes. Nothing ends the process.
+    // Format as printf(3) does, with %m, if the channel accepts the level. No level ends the
+    // process.
     void fatal(const char* fmt, ...) noexcept __attribute__((format(printf, 2, 3)));
     void crit(const char* fmt, ...) noexcept __attribute__((format(printf, 2, 3)));
     void error(const char* fmt, ...) noexcept __attribute__((format(printf, 2, 3)));
@@ -74,14 +75,14 @@ class Logger {
     void info(const std::exception& e) noexcept;
     void debug(const std::exception& e) noexcept;
 
-    // Whether debug messages pass the channel: lets a caller skip building a costly text.
+    // Whether the channel accepts debug messages. If not, a caller can skip building a costly text.
     bool isDebugEnabled() const;
 
-    // False where a message of that level is dropped for certain; true where it is wanted, or
-    // where that cannot be told so cheaply (before Logger::initialize). Takes two loads.
+    // False if a message of that level is certain to be dropped. True if the channel accepts it, or
+    // if the logger is not bound to a channel (before Logger::initialize). Costs two atomic loads.
     bool mayLog(LogLevel level) const {
         const LogChannel* const bound = _channel.load(std::memory_order_acquire);
-        // Both hints, or g++ moves the usual case out of the way.
+        // With fewer hints g++ moves the usual case off the straight path.
         return !(__builtin_expect(bound != nullptr, true) &&
                  __builtin_expect(!bound->passes(level), true));
     }
@@ -89,10 +90,10 @@ class Logger {
     // The name given to the constructor.
     const char* getChannelName() const { return _channel_name; }
 
-    // Formats into `out`, replacing its content, with printf(3)'s conversions and %m, the text of
-    // error number `errnum`, or "UNKNOWN ERROR" where strerror_r(3) knows none. `out` may be an
-    // argument too. That text becomes part of the format. A conversion that fails yields the
-    // format itself. Leaves errno alone; throws std::bad_alloc.
+    // Formats into `out`, replacing its content, with the conversions of printf(3), and %m for the
+    // text of error number `errnum` ("UNKNOWN ERROR" if strerror_r(3) has none). The text of %m
+    // becomes part of the format. `out` may also be one of the arguments. If a conversion fails,
+    // the result is the format itself. Leaves errno alone; throws std::bad_alloc.
     static void vformat(std::string& out, int errnum, const char* fmt, va_list ap)
         __attribute__((format(printf, 3, 0)));
     // The same with the current errno.
@@ -106,16 +107,17 @@ class Logger {
     // call is a failed assertion.
     static void initialize();
 
-    // Reads the configuration file, sets up appenders and channels as it says, then does the
-    // above. False when the file cannot be opened or ends inside an XML comment; lines that make
-    // no sense are reported on the channel "Logger" and passed over. korvexHome replaces
-    // "${KORVEX_HOME}" in file names. Once per process, on the main thread, before other threads
-    // log; nothing is read again later.
+    // Reads the configuration file, sets up its appenders and channels, then does what initialize()
+    // does. False if the file cannot be opened or ends inside an XML comment. Invalid lines are
+    // reported on the channel "Logger" and skipped. korvexHome replaces "${KORVEX_HOME}" at the
+    // beginning of file names. Once per process, on the main thread, before other threads log. The
+    // file is not read again later.
     static bool initialize(const Pathname& conffile, const Pathname& korvexHome);
 
-    // Sets the minimum of a channel, or of the root channel when `channel` is null, from a level's
-    // name in upper case. False, and the level unchanged, for any other word. Makes the channel if
-    // there is none, even then; only loggers built afterwards will use it. Safe from any thread.
+    // Sets the minimum of a channel, or of the root channel if `channel` is null, to the level with
+    // that name in upper case. For any other word the result is false and the level stays the same.
+    // Creates the channel if it does not exist, also for such a word. Only loggers that are built
+    // afterwards use a new channel. Safe from any thread.
     static bool setChannelLevel(const char* channel, const std::string& levelstr);
 
   private:
@@ -124,7 +126,7 @@ class Logger {
 
     LogChannel& channel() const;
 
-    // What the printf forms do once the level has passed.
+    // What the printf forms do after the test of the level.
     void logFormatted(LogLevel level, const char* fmt, ...) noexcept;
 
     const char* _channel_name;
@@ -133,10 +135,10 @@ class Logger {
     Logger* _next = nullptr;                     // in the list of loggers that wait
 };
 
-// g++ tests the level at the call, so that a filtered message costs no call: it can hand on the
-// arguments of a variadic function that it inlines. The library has the same bodies out of line,
-// for pointers to members, for clang++, and for programs that were compiled before. (Levels by
-// number: a program may have a macro DEBUG or ERROR.)
+// With g++ the level is tested where the method is called, so a filtered message costs no function
+// call: g++ can forward the arguments of a variadic function that it inlines. The library has the
+// same bodies out of line, for pointers to members, for clang++, and for programs that were
+// compiled before. (Levels are given as numbers because a program may have a macro DEBUG or ERROR.)
 #if defined(__GNUC__) && !defined(__clang__) && !defined(KORVEX_LEVEL_METHODS_OUT_OF_LINE)
 #define KORVEX_INLINE_LEVEL_METHOD(name, number)                                        \
     extern inline __attribute__((gnu_inline, always_inline, format(printf, 2, 3))) void \
@@ -155,7 +157,7 @@ KORVEX_INLINE_LEVEL_METHOD(debug, 0)
 
 }  // KORVEX_NAMESPACE(korvex)
 
-// The printf forms as macros that do not even evaluate the arguments of a message that is dropped:
+// The printf forms as macros. They do not evaluate the arguments of a message that is dropped:
 //
 //     KORVEX_DEBUG(logger, "state: %s", describeAll().c_str());
 //
@@ -167,7 +169,7 @@ KORVEX_INLINE_LEVEL_METHOD(debug, 0)
 #define KORVEX_INFO(logger, ...) KORVEX_LOG_AT(logger, info, 1, __VA_ARGS__)
 #define KORVEX_DEBUG(logger, ...) KORVEX_LOG_AT(logger, debug, 0, __VA_ARGS__)
 
-// Not for use as it stands.
+// An implementation detail of the macros above. Do not use it.
 #define KORVEX_LOG_AT(logger, method, number, ...)                           \
     do {                                                                     \
         ::korvex::Logger& korvexLogger_ = (logger);                          \

@@ -10,7 +10,7 @@ KORVEX_NAMESPACE(korvex) {
 
 class KORVEX_HIDDEN ActiveThreads;
 
-// A piece of work that is handed to another thread to run, through an InThreadActorQueue.
+// A piece of work that another thread runs. It is submitted through an InThreadActorQueue.
 class InThreadActor {
   public:
     InThreadActor() = default;
@@ -18,40 +18,41 @@ class InThreadActor {
     InThreadActor& operator=(const InThreadActor&) = delete;
     virtual ~InThreadActor() noexcept(false);
 
-    // The work; runs on the thread that owns the queue.
+    // The work. It runs on the thread that owns the queue.
     virtual void callback() = 0;
 
   private:
     friend class InThreadActorQueue;
 
     bool _wantWake = false;          // the submitter waits
-    ConditionWakeAll _cond;          // where it waits
+    ConditionWakeAll _cond;          // what it waits on
     bool _ran = false;               // the work has run
     bool _queued = false;            // it waits on a queue
     InThreadActor* _next = nullptr;  // in the queue
 };
 
-// Work for one thread, in the order in which it was submitted. Any thread may submit; the thread
-// that owns the queue runs it. Actors are not owned and are on one queue at a time, once: a second
-// submission before the actor has begun to run is a failed assertion.
+// A queue of work for one thread, in the order of submission. Any thread may submit; the thread
+// that owns the queue runs the work. The queue does not own its actors. An actor can be queued only
+// once at a time: to submit it again before it has begun to run is a failed assertion.
 class InThreadActorQueue {
   public:
     InThreadActorQueue() = default;
     InThreadActorQueue(const InThreadActorQueue&) = delete;
     InThreadActorQueue& operator=(const InThreadActorQueue&) = delete;
 
-    // Leaves the actor for the owner and returns at once. The actor must live until it has run,
-    // and may delete itself in callback().
+    // Queues the actor and returns at once. The actor must live until it has run. It may delete
+    // itself in callback().
     void submit(InThreadActor& actor);
-    // Returns once the actor has run (or its callback has thrown). The actor must outlive the
-    // call, so it must not delete itself; the owner itself would wait for ever.
+    // Queues the actor and returns when it has run (or its callback has thrown). The actor must
+    // outlive the call, so it must not delete itself. The owner of the queue must not call this: it
+    // would wait for ever.
     void submitAndWait(InThreadActor& actor);
 
-    // For the owner: runs what is queued at the call, in order, and tells how many actors that
-    // were. What callbacks add meanwhile, themselves perhaps, stays for the next call. An exception
-    // of a callback comes through; the rest stays queued.
+    // For the owner: runs the actors that are queued at the call, in order, and returns how many it
+    // ran. Actors that are added by callbacks meanwhile stay for the next call. If a callback
+    // throws, the exception leaves this function and the rest stays queued.
     std::size_t runQueued();
-    // For the owner: waits until there is work, at most timeoutSecs seconds; whether there is.
+    // For the owner: waits for work, at most timeoutSecs seconds. Returns whether there is any.
     bool waitForWork(unsigned int timeoutSecs);
 
   private:
@@ -74,51 +75,53 @@ class InThreadActorQueue {
 //     worker.go();
 //     worker.join();
 //
-// The operating-system thread starts in the constructor, with a stack of 1 MiB, and waits at a gate
-// until go(), so that main() never meets a half-built object. An exception that leaves main() ends
-// the process (std::terminate). join() and the destructor belong to one thread.
+// The constructor starts the operating-system thread, with a stack of 1 MiB. That thread waits for
+// go(), so main() never sees an object that is not fully constructed. An exception that leaves
+// main() ends the process (std::terminate). The same thread must call join() and the destructor.
 //
 // After fork(2) the child has none of the parent's threads: it must not join or destroy their
 // objects. It may build Threads of its own.
 //
 // After mainThreadDying() this object may be destroyed while its operating-system thread still
-// runs: the thread keeps its name and finds current() null. But nothing can guard the object's own
-// members: once go() was called, either main() is known to have begun, and touches the object no
-// more, or the thread is joined.
+// runs. The thread keeps its name, and current() is null there. But nothing protects the members of
+// the object. So after go(), destroy it only if the thread was joined, or if main() has begun and
+// does not touch the object any more.
 //
-// A derived class whose constructor throws leaves a thread that nobody can join: the destructor's
-// assertion ends the process. Do in main() what may fail.
+// If the constructor of a derived class throws, nobody can join the thread, and the assertion in
+// the destructor ends the process. So do in main() what may fail.
 class Thread : public PthreadObject {
   public:
-    // Joins and then deletes its thread. Queue it on another thread (submit(), never
-    // submitAndWait()) and a thread made with new can have itself cleared away.
+    // Joins a thread and then deletes its Thread object. A Thread that was made with new can end
+    // its own life this way: it queues its helper for another thread, by submit(), not
+    // submitAndWait().
     class JoinHelper : public InThreadActor {
       public:
-        // A null thread is none.
+        // `thr` may be null.
         explicit JoinHelper(Thread* thr) : _thr(thr) {}
-        // Nothing when there is no thread.
+        // Does nothing if there is no thread.
         void callback() override;
 
       private:
         Thread* const _thr;
     };
 
-    // The main thread's object. Throws PthreadException "Main Thread created twice!". A stack size
-    // that cannot be set is a warning on the channel "Thread"; threads then get the platform's.
+    // The object of the main thread. Throws PthreadException "Main Thread created twice!". If the
+    // stack size cannot be set, logs a warning on the channel "Thread"; threads then get the
+    // platform's default.
     Thread();
     // A worker. The name is not copied and must outlive it. Throws PthreadException "Thread
     // created before main thread!", and when the thread cannot be created (checked).
     explicit Thread(const char* thrname);
     Thread(const Thread&) = delete;
     Thread& operator=(const Thread&) = delete;
-    // A failed assertion when the thread was not joined, unless mainThreadDying() was called; then
-    // a thread that is still at its gate ends without running main(), opened or not.
+    // A failed assertion if the thread was not joined, unless mainThreadDying() was called. In that
+    // case a thread that has not begun to run main() ends without running it, even after go().
     virtual ~Thread() noexcept(false);
 
-    // The body of the thread. Not called for the main thread's object.
+    // The body of the thread. Not called for the object of the main thread.
     virtual void main();
 
-    // Opens the gate. A second call is a failed assertion.
+    // Lets the thread run main(). A second call is a failed assertion.
     void go();
     // Waits until the thread has ended (pthread_join(3), checked). A second call is a failed
     // assertion.
@@ -130,18 +133,18 @@ class Thread : public PthreadObject {
     bool isCurrent() const;
     // Whether both are the same thread.
     bool operator==(const Thread& other) const;
-    // This thread's join helper; belongs to the thread.
+    // The join helper of this thread, owned by this object.
     JoinHelper& joinHelper() { return _jhelp; }
 
-    // The calling thread's object; null on the main thread, on threads not made by this class, and
-    // once the object is gone. Takes no lock.
+    // The object of the calling thread. Null on the main thread, on threads not made by this class,
+    // and after the object was destroyed. Takes no lock.
     static Thread* current();
-    // The calling thread's name, even when its object is gone; "Main Thread" on the main thread and
-    // on threads not made by this class. Takes no lock.
+    // The name of the calling thread, also after its object was destroyed. "Main Thread" on the
+    // main thread and on threads not made by this class. Takes no lock.
     static const char* currentName();
 
-    // For the end of the process: from now on failures of the thread library are ignored and
-    // threads need not be joined. Cannot be taken back.
+    // For the end of the process. From now on failures of the thread library are ignored, and
+    // threads need not be joined. Cannot be undone.
     static void mainThreadDying();
 
   private:
@@ -157,9 +160,9 @@ class Thread : public PthreadObject {
 
     PthreadToken _token;
     const char* const _name;
-    bool _created = false;  // there is a thread to join
+    bool _created = false;  // whether there is a thread to join
     bool _did_join;
-    // Shared with the operating-system thread, which may be waiting there when this object goes.
+    // Shared with the operating-system thread, which may wait there when this object is destroyed.
     std::shared_ptr<Gate> _gate;
     JoinHelper _jhelp;
 };

@@ -12,29 +12,29 @@ KORVEX_NAMESPACE(korvex) {
 
 class KORVEX_HIDDEN Deadline;
 
-// What a failed thread-library call becomes: what() names the thread, the call and the error.
+// Thrown when a call of the thread library fails. what() names the thread, the call and the error.
 class PthreadException : public std::runtime_error {
   public:
     // Copies the text.
     explicit PthreadException(const char* message) : std::runtime_error(message) {}
 };
 
-// Base of the wrappers of POSIX threads; carries the check of the calls' results.
+// Base of the wrappers of POSIX threads. It has the check of the results of calls.
 class PthreadObject {
   public:
-    // Nothing when rval is 0, or once Thread::mainThreadDying() has switched checking off.
+    // Does nothing if rval is 0, or after Thread::mainThreadDying(), which switches checking off.
     // Otherwise logs a warning on the channel "Thread" and throws PthreadException with the same
-    // text: the current thread's name, `funcname` and the meaning of error number `rval`.
+    // text: the name of the current thread, `funcname`, and the meaning of error number `rval`.
     static void checkPtRes(const char* funcname, int rval);
 };
 
 // The identity of a thread. A plain value.
 class PthreadToken {
   public:
-    // No thread's token yet.
+    // The token of no thread.
     PthreadToken() = default;
 
-    // The calling thread's.
+    // The token of the calling thread.
     static PthreadToken self();
 
     // By pthread_equal(3).
@@ -46,8 +46,8 @@ class PthreadToken {
     pthread_t _token{};
 };
 
-// A plain, non-recursive lock with POSIX's default attributes: locking it twice from one thread
-// deadlocks. Any thread may use it. "Checked" below: by PthreadObject::checkPtRes.
+// A plain, non-recursive lock with the default attributes of POSIX: to lock it twice from one
+// thread is a deadlock. Any thread may use it. "Checked" below means by PthreadObject::checkPtRes.
 class KORVEX_CAPABILITY("mutex") Mutex : public PthreadObject {
   public:
     // Checked.
@@ -57,17 +57,18 @@ class KORVEX_CAPABILITY("mutex") Mutex : public PthreadObject {
     // Checked, so destroying a locked mutex throws.
     ~Mutex() noexcept(false);
 
-    // Checked; a lock that fails is not held.
+    // Checked. If lock() fails, the lock is not held.
     void lock() KORVEX_ACQUIRE();
     void unlock() KORVEX_RELEASE();
-    // Whether the lock was free and is now held. Any failure but "busy" is checked.
+    // Whether the lock was free and is now held. Any failure except "busy" is checked.
     bool tryLock() KORVEX_TRY_ACQUIRE(true);
-    // The same by the standard's name, so that std::unique_lock and std::scoped_lock take a Mutex.
+    // The same by its name in the standard, so that std::unique_lock and std::scoped_lock accept a
+    // Mutex.
     bool try_lock() KORVEX_TRY_ACQUIRE(true) { return tryLock(); }
 
     // For code that must not log: unchecked. True when the lock is held.
     bool NOLOG_lock() KORVEX_TRY_ACQUIRE(true);
-    // pthread_mutex_unlock(3)'s own result.
+    // Returns the result of pthread_mutex_unlock(3).
     int NOLOG_unlock() KORVEX_RELEASE();
 
   private:
@@ -76,19 +77,19 @@ class KORVEX_CAPABILITY("mutex") Mutex : public PthreadObject {
     pthread_mutex_t _pthread_mutex{};
 };
 
-// A lock that its owner may take again: as many unlocks as locks set it free.
+// A lock that its owner may lock again. It is free after as many calls of unlock() as of lock().
 class RecursiveMutex {
   public:
     RecursiveMutex() = default;
     RecursiveMutex(const RecursiveMutex&) = delete;
     RecursiveMutex& operator=(const RecursiveMutex&) = delete;
-    // As Mutex's.
+    // As in Mutex.
     ~RecursiveMutex() noexcept(false) = default;
 
-    // All checked, as Mutex's are.
+    // Both checked, as in Mutex.
     void lock();
     bool tryLock();
-    // Does not look at who calls; a failed assertion when nobody holds the lock.
+    // Checked. Any thread may call it. A failed assertion if nobody holds the lock.
     void unlock();
 
   private:
@@ -108,7 +109,7 @@ class KORVEX_SCOPED_CAPABILITY ScopedMutex {
     explicit ScopedMutex(Mutex& mutex) KORVEX_ACQUIRE(mutex);
     ScopedMutex(const ScopedMutex&) = delete;
     ScopedMutex& operator=(const ScopedMutex&) = delete;
-    // Unlocks; a failure throws unless another exception is on its way.
+    // Unlocks. A failure throws, except while another exception propagates.
     ~ScopedMutex() noexcept(false) KORVEX_RELEASE();
 
   private:
@@ -118,14 +119,14 @@ class KORVEX_SCOPED_CAPABILITY ScopedMutex {
     const int _exceptions;
 };
 
-// Lets go of a Mutex, which the caller holds, for a scope.
+// Unlocks a Mutex, which the caller holds, for a scope.
 class KORVEX_SCOPED_CAPABILITY ScopedMutexUnlocker {
   public:
     // Unlocks; throws what Mutex::unlock throws.
     explicit ScopedMutexUnlocker(Mutex& mutex) KORVEX_RELEASE(mutex);
     ScopedMutexUnlocker(const ScopedMutexUnlocker&) = delete;
     ScopedMutexUnlocker& operator=(const ScopedMutexUnlocker&) = delete;
-    // Locks again; a failure throws unless another exception is on its way.
+    // Locks again. A failure throws, except while another exception propagates.
     ~ScopedMutexUnlocker() noexcept(false) KORVEX_RELEASE();
 
   private:
@@ -133,7 +134,7 @@ class KORVEX_SCOPED_CAPABILITY ScopedMutexUnlocker {
     const int _exceptions;
 };
 
-// A condition variable; derived classes say who is woken. Wake-ups without cause happen: test the
+// A condition variable. Derived classes decide who is woken. Spurious wake-ups happen, so test the
 // predicate again. Any thread may use it.
 class ConditionBaseClass : public PthreadObject {
   public:
@@ -143,13 +144,14 @@ class ConditionBaseClass : public PthreadObject {
     ConditionBaseClass& operator=(const ConditionBaseClass&) = delete;
     ~ConditionBaseClass() noexcept(false);
 
-    // Waits, giving the mutex, which the caller holds, free meanwhile. Checked.
+    // Waits. The caller holds the mutex, which is unlocked while it waits. Checked.
     void wait(Mutex& mutex) KORVEX_REQUIRES(mutex);
     // (The analysis does not know that a guard holds its mutex.)
     void wait(ScopedMutex& guard) KORVEX_NO_THREAD_SAFETY_ANALYSIS { wait(guard._mutex); }
-    // The same for at most timeoutSecs seconds from now, by a clock that nobody sets where the
-    // platform has one. True when woken, false when the time is over; other failures are checked,
-    // under the name "pthread_cond_timedwait_relative_np" on every platform, and then false.
+    // The same for at most timeoutSecs seconds from now, by a monotonic clock if the platform has
+    // one. True if woken, false if the time is over. Other failures are checked, on every platform
+    // under the name "pthread_cond_timedwait_relative_np"; where that does not throw, the result is
+    // false.
     bool wait(Mutex& mutex, unsigned int timeoutSecs) KORVEX_REQUIRES(mutex);
     bool wait(ScopedMutex& guard, unsigned int timeoutSecs) KORVEX_NO_THREAD_SAFETY_ANALYSIS {
         return wait(guard._mutex, timeoutSecs);
@@ -171,26 +173,26 @@ class ConditionBaseClass : public PthreadObject {
 // A condition that wakes every waiter.
 class ConditionWakeAll : public ConditionBaseClass {
   public:
-    // Wakes all who wait, whether or not the caller holds their mutex. Checked.
+    // Wakes all waiters, whether or not the caller holds their mutex. Checked.
     void wake_all() { internal_wake_all(); }
 };
 
-// One untyped pointer a thread. Use ThreadSpecificPointer.
+// One untyped pointer per thread. Use ThreadSpecificPointer instead.
 class TSP_Implementor : public PthreadObject {
   public:
-    // `cleanup` is run on a thread's value when it is replaced, and on a value that is not null
-    // when its thread ends; it must not be null where set() replaces values. Checked.
+    // `cleanup` is called with the value of a thread when set() replaces it, and when the thread
+    // ends and the value is not null. It must not be null if set() replaces values. Checked.
     explicit TSP_Implementor(void (*cleanup)(void*));
     TSP_Implementor(const TSP_Implementor&) = delete;
     TSP_Implementor& operator=(const TSP_Implementor&) = delete;
-    // Values that other threads still have are not cleaned up. Checked.
+    // The values of other threads are not cleaned up. Checked.
     ~TSP_Implementor() noexcept(false);
 
     // This thread's value; null before set().
     void* get() const;
-    // Stores a value, cleaning up the present one unless it is the same. Checked.
+    // Stores a value. Cleans up the present one, unless both are the same. Checked.
     void set(void* v);
-    // Gives the value up to the caller without cleaning it up; null stays. Checked.
+    // Returns the value without cleaning it up, and stores null. Checked.
     void* release();
 
   private:
@@ -201,7 +203,7 @@ class TSP_Implementor : public PthreadObject {
     void (*const _cleanup_fn)(void*);
 };
 
-// One pointer to a T a thread; owns what it points at.
+// One pointer to a T per thread. It owns what it points to.
 template <class T>
 class ThreadSpecificPointer {
   public:
@@ -209,9 +211,9 @@ class ThreadSpecificPointer {
 
     // This thread's object; null before set().
     T* get() const { return static_cast<T*>(_impl.get()); }
-    // Takes ownership of `v`; deletes the present object unless it is the same.
+    // Takes ownership of `v`. Deletes the present object, unless both are the same.
     void set(T* v) { _impl.set(v); }
-    // Hands this thread's object over to the caller.
+    // Gives ownership of this thread's object to the caller.
     T* release() { return static_cast<T*>(_impl.release()); }
 
   private:

@@ -9,16 +9,16 @@
 
 KORVEX_NAMESPACE(korvex) {
 
-// A wall-clock instant: seconds and microseconds since the Unix epoch. Seconds keep to the signed
-// 32-bit range whatever the platform's time_t is: additions and the clock saturate at the largest
-// instant ("max", 2147483647 s 999999 us) instead of wrapping. A plain value.
+// A wall-clock instant: seconds and microseconds since the Unix epoch. The seconds stay in the
+// signed 32-bit range, whatever the platform's time_t is. Additions and the clock saturate at the
+// largest instant ("max", 2147483647 s 999999 us); they never wrap. A plain value.
 class Timeval {
   public:
     // The Unix epoch.
     Timeval() = default;
 
-    // The current time, as gettimeofday(2) tells it. A clock past 2038 is max. When the call fails
-    // the process aborts: the rest of the system takes the clock for infallible.
+    // The current time by gettimeofday(2). A time after the last instant becomes max. If the call
+    // fails, the process aborts: all other code relies on the clock.
     void setToNow();
     static Timeval now();
 
@@ -32,28 +32,29 @@ class Timeval {
     // Milliseconds within the second, cut: 0 to 999.
     int msec() const { return static_cast<int>(_tv.tv_usec) / 1000; }
 
-    // Add a time span; a sum beyond max is max.
+    // Add a time span. A sum beyond max is max.
     void addSec(unsigned int secs);
     void addMsec(unsigned long long msecs);
 
-    // The instant as local calendar fields, by localtime_r(3); aborts the process when that fails.
+    // The instant as local calendar fields, by localtime_r(3). If that fails, the process aborts.
     void localtime(struct tm& out) const;
 
-    // Which instant comes first, to the microsecond.
+    // Compare instants, to the microsecond.
     bool operator<(const Timeval& other) const;
     bool operator<=(const Timeval& other) const;
     bool operator>(const Timeval& other) const { return other < *this; }
     bool operator>=(const Timeval& other) const { return other <= *this; }
 
-    // Milliseconds from `earlier` to `later`, a remainder of microseconds counted as one more:
-    // 1 us is 1 ms, -1 us is 0. Negative when `later` comes first.
+    // Milliseconds from `earlier` to `later`, rounded up: 1 us is 1 ms, -1 us is 0. Negative if
+    // `later` comes first.
     static long long msecDifference(const Timeval& later, const Timeval& earlier);
-    // Whole seconds times a million plus the rest in MILLIseconds: 2.5 s are 2000500. Callers rely
-    // on it, describeDifference among them; compute true microseconds yourself.
+    // Not microseconds, despite its name: whole seconds times a million, plus the rest in
+    // MILLIseconds. 2.5 s are 2000500. Existing callers and describeDifference rely on it. Compute
+    // true microseconds yourself.
     static long long usecDifference(const Timeval& later, const Timeval& earlier);
-    // The distance for people: "2.500 hours", "42.00 seconds", "2000 milliseconds", "0
-    // microseconds", with "-" in front when `later` comes first. Built on usecDifference, so what
-    // is less than a second shows as a thousandth of itself: 3.25 s are "3.000 seconds", 1 ms is
+    // The difference as a text for people: "2.500 hours", "42.00 seconds", "2000 milliseconds", "0
+    // microseconds", with "-" in front if `later` comes first. It uses usecDifference, so the part
+    // below one second is a thousand times too small: 3.25 s are "3.000 seconds", 1 ms is
     // "1 microsecond". Throws std::bad_alloc.
     static std::string describeDifference(const Timeval& later, const Timeval& earlier);
 
@@ -71,9 +72,9 @@ class Timeval {
 // A Timeval that starts as the current time.
 class CurrentTimeval : public Timeval {
   public:
-    // Aborts the process when the clock fails, as setToNow() does.
+    // Aborts the process if the clock fails, as setToNow() does.
     CurrentTimeval() { setToNow(); }
-    // A copy keeps its source's instant, and an assignment takes it: neither looks at the clock.
+    // A copy and an assignment take the instant of the source. Neither reads the clock.
     CurrentTimeval(const CurrentTimeval&) = default;
     CurrentTimeval& operator=(const CurrentTimeval&) = default;
     CurrentTimeval& operator=(const Timeval& other) {
@@ -83,13 +84,13 @@ class CurrentTimeval : public Timeval {
     ~CurrentTimeval() = default;
 };
 
-// Reads a duration in seconds, decimal digits with an optional fraction ("2", "1.5", ".25", "5."),
-// after leading blanks and tabs, into *res as milliseconds. There is no sign, exponent or unit: the
-// caller looks at what follows by *charCount, the number of characters read from p on (leading
-// blanks included; charCount may be null). The fraction's first four digits count, half a
-// millisecond rounds up, and a positive duration is never less than 1. A number too large for 64
-// bits gives 18446744073709551615 and success. False, *res 0 and *charCount 0, when there is
-// nothing to read. p must be NUL-terminated.
+// Reads a duration in seconds and stores it in *res as milliseconds. The text has decimal digits
+// with an optional fraction ("2", "1.5", ".25", "5."), after leading blanks and tabs. It has no
+// sign, exponent or unit. *charCount is the number of characters that were read from p, leading
+// blanks included, so that the caller can check what follows; charCount may be null. The first four
+// digits of the fraction count. Half a millisecond rounds up, and a positive duration is at
+// least 1. A number too large for 64 bits gives 18446744073709551615 and success. If there is no
+// number, the result is false, and *res and *charCount are 0. p must be NUL-terminated.
 KORVEX_EXPORT bool convert_string_to_milliseconds(const char* p, unsigned long long* res,
                                                   unsigned long* charCount);
 

@@ -10,8 +10,8 @@
 inline namespace korvex {
 
 // The loop of every whole-buffer transfer: call(p, n) moves up to n bytes, as read(2) and write(2)
-// do. Goes on after short counts and interruptions, stops at 0, at an error and at INT_MAX bytes,
-// which is all the result can tell.
+// do. Continues after short counts and interruptions. Stops at 0, at an error, and at INT_MAX
+// bytes, the largest possible result.
 template <class Byte, class Call>
 int transferAll(Byte* p, std::size_t n, Call call) {
     const int errnoBefore = errno;

@@ -25,7 +25,7 @@ const struct poptOption LoaderInfo::CommandLine::_poptOptionsMaster[11] = {
 
 LoaderInfo::CommandLine::CommandLine(int argc, const char* const* argv) {
     if (argc > 0) _arguments.assign(argv, argv + argc);
-    // popt reads the second argument of an empty vector; the program's name is not looked at.
+    // popt reads the second element even of an empty vector. The program's name is not used.
     if (_arguments.empty()) _arguments.emplace_back("korvexd");
     for (const std::string& argument : _arguments)
         _argv.push_back(argument.c_str());
@@ -62,7 +62,7 @@ bool LoaderInfo::CommandLine::parse() {
     return allKnown;
 }
 
-// The switches count as given or not given; everything else changes only when given.
+// Switches are set whether given or not. Other values change only if their option was given.
 void LoaderInfo::CommandLine::copyTo(LoaderInfo& info) const {
     info._isDebug = _poptIsDebug != 0;
     info._isDaemon = _poptIsNodaemon == 0;

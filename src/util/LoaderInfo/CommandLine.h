@@ -9,9 +9,9 @@
 
 inline namespace korvex {
 
-// popt's view of the command line: the option table, the fields that receive the values, and the
-// parsing context. popt keeps pointers into the argument vector and the table, so they live here,
-// beside it.
+// What popt needs to parse the command line: the option table, the fields that receive the values,
+// and the parsing context. popt keeps pointers into the argument vector and the table, so they are
+// kept here.
 class KORVEX_HIDDEN LoaderInfo::CommandLine {
   public:
     CommandLine(int argc, const char* const* argv);

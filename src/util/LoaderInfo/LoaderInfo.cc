@@ -18,7 +18,7 @@ void set_path_from_envvar(Pathname& path, const char* name) {
     Pathname tidy(value);
     tidy.removeDoubleSeps();
     tidy.removeTrailingSeps();
-    // Child processes shall see the tidy path too.
+    // Child processes get the cleaned path too.
     if (tidy != value) setenv(name, tidy.c_str(), 1);
     path = tidy;
 }

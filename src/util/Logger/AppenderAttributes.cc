@@ -1,6 +1,7 @@
 #include <korvex/util/Logger.h>
 
 #include "base/NeverDestroyed.h"
+#include "util/Logger/AppenderOutput.h"
 #include "util/Logger/AppenderRegistry.h"
 #include "util/Logger/AppenderReport.h"
 #include "util/Logger/RootObjects.h"
@@ -62,11 +63,10 @@ std::uint32_t saturated(const char* digits) {
 
 }  // namespace
 
-// This and what follows belong to start-up, before other threads log, and take no lock.
 bool LogAppender::setAttribute(const std::string& aname, const char* val,
-                               const Pathname& korvexHome) KORVEX_NO_THREAD_SAFETY_ANALYSIS {
+                               const Pathname& korvexHome) {
     if (aname == "fileName") {
-        if (this != &rootAppender()) closeFd();
+        if (this != &rootAppender()) _output->replace(FileDescriptor());
         _filename = expandHome(val, korvexHome);
         return true;
     }
@@ -94,13 +94,13 @@ bool LogAppender::setAttribute(const std::string& aname, const char* val,
     return false;
 }
 
-std::vector<const char*> LogAppender::settle() KORVEX_NO_THREAD_SAFETY_ANALYSIS {
+std::vector<const char*> LogAppender::settle() {
     std::vector<const char*> warnings;
     if (_fmt == nullptr) _fmt = &rootAppender().layout();
     if (_filename.empty()) {
-        if (!_fd.valid()) {
+        if (!_output->valid()) {
             warnings.push_back("has no filename, assuming stderr");
-            _fd = FileDescriptor(STDERR_FILENO);
+            _output->replace(FileDescriptor(STDERR_FILENO));
         }
         if (_maxBackupIndex != 0) {
             warnings.push_back("has maxBackupIndex set without specifying a filename, ignoring");
@@ -118,15 +118,13 @@ std::vector<const char*> LogAppender::settle() KORVEX_NO_THREAD_SAFETY_ANALYSIS 
     return warnings;
 }
 
-void LogAppender::finalSetup(const char* name) KORVEX_NO_THREAD_SAFETY_ANALYSIS {
+void LogAppender::finalSetup(const char* name) {
     for (const char* const warning : settle())
         LogFormat::internal(this, WARN, "Appender \"%s\" %s", name, warning);
     if (writesToFile()) {
         Report report(this);
-        closeFd();  // a report of another appender may have come here already
-        openFile(report);
+        _output->testOpen(report);
         report.deliver();
-        closeFd();
     }
 }
 

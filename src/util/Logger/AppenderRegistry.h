@@ -12,13 +12,13 @@ inline namespace korvex {
 
 using LogAppenderMap = std::map<std::string, std::unique_ptr<LogAppender>>;
 
-// Every appender made by name; never destroyed. Filled during start-up, so without a lock.
+// All appenders made by name; never destroyed. They are made during start-up, so there is no lock.
 LogAppenderMap& appenders();
 
 using LayoutList = std::vector<std::unique_ptr<const LogFormat>>;
 
-// Every layout made for an appender; shared with threads that may be writing, so one that was
-// replaced stays.
+// All layouts made for appenders. Other threads may be using one, so a layout that was replaced is
+// kept.
 LayoutList& layouts();
 
 }  // namespace korvex

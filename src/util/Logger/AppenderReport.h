@@ -8,9 +8,9 @@
 
 inline namespace korvex {
 
-// The failures met while an appender holds its lock: put into words at once, with the errno of the
-// failed call, and delivered when the lock is free, because the way of the report may lead through
-// other appenders' locks.
+// The failures that happen while an appender holds its lock. Their text is made at once, with the
+// errno of the failed call. They are delivered when the lock is free, because a report may take the
+// locks of other appenders.
 class KORVEX_HIDDEN LogAppender::Report {
   public:
     explicit Report(const LogAppender* appender) : _appender(appender) {}

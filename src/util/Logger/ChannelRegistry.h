@@ -9,8 +9,9 @@
 
 inline namespace korvex {
 
-// Every channel made by name; never destroyed. Channels are made at any time by setChannelLevel and
-// looked up by loggers being built, so this map, unlike the appenders', has a lock.
+// All channels made by name; never destroyed. setChannelLevel makes channels at any time, and
+// loggers look them up when they are constructed. So this map has a lock, unlike the one of the
+// appenders.
 struct ChannelRegistry {
     static ChannelRegistry& instance();
 

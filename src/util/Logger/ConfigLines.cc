@@ -18,7 +18,7 @@ bool endsWith(const std::string& text, std::string_view tail) {
            text.compare(text.size() - tail.size(), tail.size(), tail) == 0;
 }
 
-// Up to one character beyond the last one before the "#" that is no blank; empty without one.
+// The text before the "#", without blanks at its end except one. Empty if there are only blanks.
 void cutToContent(std::string& line) {
     const std::size_t comment = std::min(line.find('#'), line.size());
     const std::size_t last = comment == 0 ? line.npos : line.find_last_not_of(" \t", comment - 1);
@@ -55,9 +55,9 @@ bool ConfigLines::next(std::string& content) {
     return false;
 }
 
-// Copies the line up to and including its "#", leaving out XML comments. Text around a comment
-// grows together and may so form the start of another one; a single pass sees that too, because
-// it looks at what it has copied and not at the line.
+// Copies the line up to and including its "#", without XML comments. The texts before and after a
+// comment are joined, and may form the start of another comment. A single pass finds that too,
+// because it searches the copy and not the line.
 void ConfigLines::joinAroundComments(std::string& joined) {
     joined.clear();
     for (std::size_t pos = 0; pos < _line.size();) {
@@ -72,7 +72,8 @@ void ConfigLines::joinAroundComments(std::string& joined) {
     }
 }
 
-// Goes on behind the comment's end, on whatever line that is; false when the file ends before it.
+// Continues after the end of the comment, on whatever line that is. False if the file ends before
+// it.
 bool ConfigLines::handle_xml_comment(std::size_t& pos) {
     for (;;) {
         const std::size_t end = _line.find(kCommentEnd, pos);

@@ -5,7 +5,7 @@
 
 inline namespace korvex {
 
-// The lines of a logging configuration, without XML comments and without what stands behind "#".
+// The lines of a logging configuration, without XML comments and without what follows "#".
 class ConfigLines {
   public:
     static constexpr unsigned kNone = static_cast<unsigned>(-1);
@@ -13,15 +13,16 @@ class ConfigLines {
     // Reads from `file`, which it does not own.
     explicit ConfigLines(std::FILE* file) : _file(file) {}
 
-    // The content of the next line that has any; false at the end of the file. A line's content
-    // reaches one character beyond its last one that is no blank: a blank that follows a value, or
-    // the "#" that ends it, belongs to it. Configurations in use depend on what follows from that.
+    // The content of the next line that is not empty; false at the end of the file. The content
+    // includes one character after the last one that is not a blank: a blank that follows a value,
+    // or the "#" after it, is part of the value. Existing configurations depend on that.
     bool next(std::string& content);
 
     // The number of the last line read, from 1; comment lines count.
     unsigned lineno() const { return lineno_; }
 
-    // Where an XML comment began that the file's end has not closed; kNone when there is none.
+    // The line of the XML comment that is not closed at the end of the file; kNone if there is
+    // none.
     unsigned xml_comment_startline() const { return xml_comment_startline_; }
 
   private:
@@ -35,8 +36,8 @@ class ConfigLines {
     unsigned xml_comment_startline_ = kNone;
 };
 
-// Reads one line, of any length, without its newline; false at the end of the file. A NUL ends
-// what is used of the piece in which it is read, and the line goes on with the next piece.
+// Reads one line, of any length, without its newline; false at the end of the file. After a NUL,
+// the rest of the piece in which it was read is lost; the line continues with the next piece.
 bool read_line(std::string& result, std::FILE* ifile);
 
 }  // namespace korvex

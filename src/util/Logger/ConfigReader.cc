@@ -69,7 +69,7 @@ void ConfigReader::readRootCategory(const std::string& line, std::size_t key,
     }
 }
 
-// The appender comes into being as soon as its name is known, even if the line fails after that.
+// The appender is created as soon as its name is known, even if the rest of the line is invalid.
 void ConfigReader::readAppender(const std::string& line, std::size_t name) {
     if (isAt(line, name, ' ') || isAt(line, name, '\t') || isAt(line, name, '=')) {
         addParseError(line, 0);
@@ -122,7 +122,7 @@ void ConfigReader::applyRoot() {
     if (!rootChannel().setConfig(root_cnf.context.c_str())) _parseErrors.push_back(root_cnf);
 }
 
-// Applies "name=value", the text behind "category."; false when it says nothing valid.
+// Applies "name=value", the text after "category.". False if it is invalid.
 bool ConfigReader::applyCategory(const DeferedLogConf& category) {
     const std::string& cstr = category.context;
     const std::size_t equals = cstr.find('=');

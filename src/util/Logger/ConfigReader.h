@@ -22,7 +22,7 @@ struct DeferedLogConf {
 
 using DeferedLogConfList = std::list<DeferedLogConf>;
 
-// What the reader made of one line, for who explains a configuration instead of running by it.
+// How one line was understood, for code that explains a configuration instead of applying it.
 struct ConfigStatement {
     enum Kind { ROOT, CATEGORY, APPENDER, ATTRIBUTE };
     Kind kind;
@@ -35,16 +35,16 @@ struct ConfigStatement {
 
 using ConfigListener = std::function<void(const ConfigStatement&)>;
 
-// Reads a logging configuration line by line. Appenders take shape at once. Root and categories
-// are applied at the end, because a new channel copies the root's final state and may name
-// appenders that are defined further down.
+// Reads a logging configuration line by line. Lines of appenders are applied at once. Root and
+// categories are applied at the end, because a new channel copies the final state of the root, and
+// may name appenders that are defined further down.
 class ConfigReader {
   public:
     // Reads from `file`, which it does not own; korvexHome replaces "${KORVEX_HOME}".
     ConfigReader(std::FILE* file, const Pathname& korvexHome);
 
-    // The listener hears of the root's value, of each appender that a line names and of each
-    // attribute as they are read, of categories as they are applied.
+    // The listener is called for the value of the root, for each appender that a line names and for
+    // each attribute when they are read, and for categories when they are applied.
     void setListener(ConfigListener listener) { _listener = std::move(listener); }
 
     void readAll();

@@ -52,8 +52,8 @@ void EarlyLoggers::initialize() {
     KORVEX_ASSERT(!logger_initialized);
     epoch_timeval();
     logger_initialized = true;
-    // A logger that is bound is its owner's alone again and may be destroyed at once: taken off the
-    // list first, it is not looked at after that.
+    // The owner of a logger may destroy it as soon as it is bound. So it is taken off the list
+    // first, and not used after it was bound.
     while (Logger* const logger = uninitialized_loggers) {
         uninitialized_loggers = logger->_next;
         logger->_next = nullptr;

@@ -14,11 +14,11 @@ extern std::atomic<bool> logger_initialized;
 // list has a lock; nothing here is called for a bound logger.
 class KORVEX_HIDDEN EarlyLoggers {
   public:
-    // Puts the logger on the list, or binds it when initialisation was faster.
+    // Puts the logger on the list, or binds it if logging was initialised meanwhile.
     static void add(Logger& logger);
     // Takes it off the list, if it is there.
     static void remove(Logger& logger);
-    // Whether logging is not initialised and the logger not on the list: not constructed yet.
+    // True if logging is not initialised and the logger is not on the list, so not constructed yet.
     static bool isUnusable(const Logger& logger);
     // Marks logging as initialised and binds every logger on the list, newest first.
     static void initialize();

@@ -6,8 +6,8 @@
 
 inline namespace korvex {
 
-// Writes "LEVEL - text" and a newline to descriptor 2 with one write(2), whose failure is nobody's
-// business any more. Throws std::bad_alloc.
+// Writes "LEVEL - text" and a newline to descriptor 2 with one write(2). A failure is ignored.
+// Throws std::bad_alloc.
 void fallback_to_stderr(LogLevel level, const std::string& text);
 
 }  // namespace korvex

@@ -10,9 +10,10 @@
 
 inline namespace korvex {
 
-// Holds an object that is built at its first use and never destroyed. Unlike a function's static it
-// is built under a lock of ours, which is taken before a fork: the C++ library's own would stay
-// taken for ever in a child that is forked while another thread builds the object.
+// Holds an object that is built at its first use and never destroyed. It is built under a lock of
+// the library, which is taken before a fork. For a static of a function, the C++ library has a lock
+// of its own; that lock would stay locked in a child that is forked while another thread builds the
+// object.
 template <class T>
 class FirstUse {
   public:

@@ -14,7 +14,8 @@ const char* describe(int errnum, char (&buf)[1000]) {
     return errorText(errnum, buf, sizeof buf) ? buf : "UNKNOWN ERROR";
 }
 
-// The format with each %m replaced by the error's text; a %% pair stays, so "%%m" is no %m.
+// The format with each %m replaced by the text of the error. A pair %% is skipped, so "%%m" is not
+// %m.
 std::string withErrorText(const char* fmt, int errnum) {
     char buf[1000];
     const char* const description = describe(errnum, buf);
@@ -38,7 +39,7 @@ void formatByPrintf(std::string& out, const char* fmt, va_list ap)
 
 void formatByPrintf(std::string& out, const char* fmt, va_list ap) {
     const PrintfBuffer text(fmt, ap);
-    // Better the bare format than a line lost to an argument that cannot be shown.
+    // If an argument cannot be converted, log the format itself rather than nothing.
     if (text.ok()) {
         out.assign(text.data(), text.size());
     } else {
@@ -50,7 +51,7 @@ void formatByPrintf(std::string& out, const char* fmt, va_list ap) {
 
 void Logger::vformat(std::string& out, int errnum, const char* fmt, va_list ap) {
     const ErrnoKeeper keeper;
-    errno = errnum;  // for glibc's own %m, which "%-40m" is
+    errno = errnum;  // for "%-40m", which glibc itself replaces
     if (std::strstr(fmt, "%m") == nullptr) {
         formatByPrintf(out, fmt, ap);
     } else {

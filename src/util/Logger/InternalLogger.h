@@ -6,12 +6,12 @@
 
 inline namespace korvex {
 
-// What the logging system's own messages go through. Built at the first of them, because a channel
-// "Logger" may be made until then.
+// The logger of the logging system's own messages. It is built at the first of them, because the
+// channel "Logger" may be made later than at start-up.
 FirstUse<Logger>& internalLogger();
 
-// Stands in for its channel while it is unbound: the root channel's minimum is none of the logging
-// system's business.
+// The channel that it uses while it is unbound: the minimum of the root channel must not hide these
+// messages.
 LogChannel& emptyChannel();
 
 }  // namespace korvex

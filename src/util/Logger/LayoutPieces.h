@@ -26,7 +26,7 @@ struct LayoutPiece {
         EPOCH_SEC,
         PROCESSOR_TIME,
         DATE,
-        OTHER  // what this class was not told of
+        OTHER  // an atom that this class does not know
     };
     static constexpr unsigned kUnlimited = ~0U;
 
@@ -35,10 +35,10 @@ struct LayoutPiece {
     std::vector<DatePiece> date;
     unsigned minWidth;
     unsigned maxWidth;  // bytes; kUnlimited
-    char padding;       // fills up in front; 0: blanks behind
+    char padding;       // pads before the text; 0: blanks after it
 };
 
-// A compiled layout laid open, for a tool that must know what its lines look like.
+// The parts of a compiled layout, for a tool that must know what its lines look like.
 class KORVEX_HIDDEN LayoutPieces {
   public:
     static std::vector<LayoutPiece> of(const LogFormat& layout);

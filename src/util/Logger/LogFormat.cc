@@ -12,7 +12,7 @@ inline namespace korvex {
 
 namespace {
 
-// One piece of a line before it is fitted to its widths. It borrows what it points at.
+// One piece of a line, before it is padded or cut. It does not own what it points to.
 struct Text {
     const char* data;
     unsigned long size;
@@ -29,7 +29,7 @@ unsigned long long msecSinceEpoch(const LogMsgMetadata& md) {
 
 }  // namespace
 
-// Produces one line: what the atoms of the line share.
+// What the atoms of one line share.
 class KORVEX_HIDDEN LogFormat::Line {
   public:
     Line(std::string& out, const LogMsgMetadata& md, const std::string& msg)
@@ -57,7 +57,7 @@ class KORVEX_HIDDEN LogFormat::Line {
     std::string& _out;
     const LogMsgMetadata& _md;
     const std::string& _msg;
-    CachedTm _tm;  // so that every date of the line shows the same local time
+    CachedTm _tm;  // shared, so that all dates of the line show the same time
     std::string _dateText;
     char _digits[20];  // of 64 bits
 };

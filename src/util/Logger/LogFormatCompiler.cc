@@ -27,8 +27,8 @@ void LogFormat::Compiler::compile() {
     }
 }
 
-// Everything up to the next conversion. A "%%" ends a run with its first percent sign and is
-// skipped whole, so that it prints one.
+// The text up to the next conversion. A "%%" ends the text after its first percent sign, and both
+// are skipped, so it prints one.
 void LogFormat::Compiler::literalRuns() {
     const char* run = _p;
     while (const char* percent = std::strchr(_p, '%')) {
@@ -54,8 +54,8 @@ void LogFormat::Compiler::literal(const char* from, const char* to) {
     atom.maxw = kUnlimited;
 }
 
-// One conversion; false when the pattern ends inside it, which ends the compilation without an
-// atom for it.
+// One conversion. False if the pattern ends inside it; then there is no atom for it, and the
+// compilation ends.
 bool LogFormat::Compiler::conversion() {
     KORVEX_ASSERT_AS(*_p == '%', "*p == '%'");
     ++_p;
@@ -85,7 +85,7 @@ void LogFormat::Compiler::flagAndWidths(Atom& atom) {
     }
 }
 
-// A run of digits; 0 when there is none. Saturates: a width too large to count is the largest.
+// A run of digits; 0 if there is none. A number that is too large becomes the largest.
 unsigned int LogFormat::Compiler::number() {
     unsigned int n = 0;
     for (; isDigit(*_p); ++_p) {
@@ -105,7 +105,7 @@ bool LogFormat::Compiler::braceArgument(const char*& begin, const char*& end) {
     return true;
 }
 
-// Makes the atom what the letter says; false for a letter that means nothing.
+// Sets the atom for the letter. False for an unknown letter.
 bool LogFormat::Compiler::set(Atom& atom, char letter, const char* argBegin, const char* argEnd) {
     static constexpr struct {
         char letter;

@@ -18,8 +18,8 @@ namespace {
 
 constexpr std::string_view kIso8601 = "%Y-%m-%d %H:%M:%S,%l";
 
-// What a pattern without widths may produce at the very most, long locale texts and all: the
-// bound beyond which an empty result is no longer taken for a buffer too small.
+// The longest text that a pattern without widths may produce in any locale. With a buffer of this
+// size, an empty result does not mean that the buffer is too small.
 constexpr unsigned long kAmpleOutput = 4UL << 20;
 
 constexpr unsigned long kFirstBuffer = 64;  // bytes that strftime(3) is offered first
@@ -80,7 +80,7 @@ void appendMsec(std::string& out, unsigned msec) {
     out.append(digits, std::min<std::size_t>(size, 3));
 }
 
-// Writes the number of one such conversion; behind it.
+// Writes the number of one such conversion. Returns the place after it.
 char* writeNumber(char* to, char conversion, const struct tm& tm) {
     switch (conversion) {
         case 'Y':
@@ -114,7 +114,7 @@ void appendNumbers(std::string& out, const std::string& piece, const struct tm& 
     out.resize(static_cast<std::size_t>(to - out.data()));
 }
 
-// Longer than any output of the piece: ample room, and every number in it read as a width.
+// A length that no output of the piece can reach. Every number in the piece counts as a width.
 unsigned long outputLimit(const std::string& piece) {
     constexpr unsigned long most = std::numeric_limits<unsigned long>::max() / 4;
     unsigned long limit = kAmpleOutput + piece.size() * 64;

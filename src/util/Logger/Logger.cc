@@ -1,4 +1,4 @@
-// The bodies below are the ones out of line.
+// The functions below are not inline.
 #define KORVEX_LEVEL_METHODS_OUT_OF_LINE
 #include <korvex/util/Logger.h>
 
@@ -34,8 +34,8 @@ Logger& Logger::operator=(const Logger& other) {
     return *this;
 }
 
-// A bound logger is not on the list. Its own state, not the global flag, decides: the list may be
-// being emptied just now.
+// A bound logger is not on the list. Its own state decides and not the global flag, because another
+// thread may be emptying the list.
 Logger::~Logger() {
     if (_channel.load(std::memory_order_acquire) == nullptr) EarlyLoggers::remove(*this);
 }
@@ -51,8 +51,8 @@ bool Logger::isDebugEnabled() const {
 
 namespace {
 
-// Here and not beside LoggingLocks, because of an archive only those files are linked that somebody
-// needs, and nobody who logs can do without this one.
+// This is here and not beside LoggingLocks, because the linker takes only those files from an
+// archive that are needed. Every program that logs needs this one.
 KORVEX_REGISTERS_LOGGING_LOCKS void keepLocksThroughForks() {
     pthread_atfork(&LoggingLocks::takeAll, &LoggingLocks::freeAll, &LoggingLocks::freeAll);
 }
@@ -68,8 +68,8 @@ void Logger::logFormatted(LogLevel level, const char* fmt, ...) noexcept {
     va_end(ap);
 }
 
-// A variadic function cannot hand its arguments on without naming them, so each level has its own
-// three bodies, from this one text. The level is tested before anything else is done.
+// A variadic function cannot forward its arguments, so each level has three functions of its own,
+// made by this macro. They test the level first.
 #define KORVEX_LEVEL_METHODS(name, LEVEL)                 \
     void Logger::name(const char* fmt, ...) noexcept {    \
         if (!mayLog(LEVEL)) return;                       \

@@ -6,14 +6,14 @@
 
 inline namespace korvex {
 
-// Holds one of the logging system's mutexes for a scope without ever logging or throwing. A lock
-// that fails is done without: a log line that may mix with another one is better than none. (The
-// analysis takes it for held.)
+// Holds one of the logging system's mutexes for a scope. Never logs and never throws. If the lock
+// cannot be taken, the code runs without it: a log line that may mix with another one is better
+// than none. (The analysis takes it for held.)
 class KORVEX_SCOPED_CAPABILITY LoggingLock {
   public:
-    // What LoggingLocks takes before a fork its thread has then already: a handler of somebody
-    // else's that runs between ours may log. Not so the mutex of an appender that nobody
-    // registered, which is `own`.
+    // During a fork, the thread already holds what LoggingLocks took, and a handler of other code
+    // that runs between ours may log. That does not hold for the mutex of an appender that is not
+    // registered; for this one, `own` is true.
     enum Kind { KEPT_THROUGH_FORKS, OWN };
 
     explicit LoggingLock(Mutex& mutex, Kind kind = KEPT_THROUGH_FORKS)

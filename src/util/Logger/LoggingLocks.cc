@@ -4,6 +4,7 @@
 
 #include "base/HeldLocks.h"
 #include "base/ThreadText.h"
+#include "util/Logger/AppenderOutput.h"
 #include "util/Logger/AppenderRegistry.h"
 #include "util/Logger/ChannelRegistry.h"
 #include "util/Logger/EarlyLoggers.h"
@@ -36,9 +37,9 @@ void LoggingLocks::takeAll() KORVEX_NO_THREAD_SAFETY_ANALYSIS {
     internalLogger().mutex().NOLOG_lock();
     EarlyLoggers::mutex().NOLOG_lock();
     ChannelRegistry::instance().mutex.NOLOG_lock();
-    rootAppender()._mutex.NOLOG_lock();
+    rootAppender()._output->hold();
     for (const auto& [name, appender] : appenders())
-        appender->_mutex.NOLOG_lock();
+        appender->_output->hold();
     epoch().mutex().NOLOG_lock();
     HeldLocks::setAll(true);
 }
@@ -47,8 +48,8 @@ void LoggingLocks::freeAll() KORVEX_NO_THREAD_SAFETY_ANALYSIS {
     HeldLocks::setAll(false);
     epoch().mutex().NOLOG_unlock();
     for (const auto& [name, appender] : appenders())
-        appender->_mutex.NOLOG_unlock();
-    rootAppender()._mutex.NOLOG_unlock();
+        appender->_output->release();
+    rootAppender()._output->release();
     ChannelRegistry::instance().mutex.NOLOG_unlock();
     EarlyLoggers::mutex().NOLOG_unlock();
     internalLogger().mutex().NOLOG_unlock();

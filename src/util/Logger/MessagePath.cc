@@ -51,7 +51,7 @@ bool formatInto(std::string& text, int errnum, const char* fmt, va_list ap) noex
 
 bool LogFormat::findTaker(const Logger& logger, LogLevel level, LogChannel*& taker) {
     taker = nullptr;
-    // A signal handler that interrupted logging would wait for what its own thread holds.
+    // A signal handler that interrupted logging would wait for a lock of its own thread.
     if (HeldLocks::any()) return logger.channel().passes(level);
     if (check_for_unitialized_logger(&logger)) return true;
     taker = &logger.channel();

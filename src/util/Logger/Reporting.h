@@ -6,10 +6,10 @@
 
 inline namespace korvex {
 
-// Marks, for its scope, that this thread is delivering a report: one of the logging system's own
-// messages. An appender that fails meanwhile reports that in turn, within the scope; so the
-// outermost mark remembers who has failed, and such an appender is not tried again before that
-// scope ends. Each failure is told once, and any number of broken appenders come to an end.
+// Marks, for a scope, that this thread is delivering a report: a message of the logging system
+// itself. If an appender fails meanwhile, that failure is reported too, within the scope. The
+// outermost object remembers the appenders that failed, and these are not tried again before its
+// scope ends. So each failure is reported once, and the reports end, however many appenders fail.
 class ReportingMark {
   public:
     // `failed` is the appender whose failure is reported; null when it is no appender's.
@@ -23,8 +23,8 @@ class ReportingMark {
         if (_outermost) _top = nullptr;
     }
 
-    // Whether the appender has failed, and so is not to be tried, in the report that this thread is
-    // delivering just now.
+    // Whether the appender failed in the report that this thread is delivering. Then it is not
+    // tried again.
     static bool hasFailed(const LogAppender* appender) {
         return _top != nullptr && _top->remembers(appender);
     }
@@ -33,7 +33,7 @@ class ReportingMark {
     void remember(const LogAppender* failed) noexcept {
         try {
             _failed.push_back(failed);
-        } catch (...) {  // no memory: then nobody is tried, and standard error tells
+        } catch (...) {  // no memory: no appender is tried; the report goes to standard error
             _everybody = true;
         }
     }

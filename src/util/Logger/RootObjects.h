@@ -6,7 +6,7 @@
 
 inline namespace korvex {
 
-// What every message can fall back on. Built at first use, never destroyed.
+// The defaults of logging. Built at first use, never destroyed.
 
 const LogFormat& defaultFormat();  // "%m%n"
 LogAppender& rootAppender();       // standard error, laid out by defaultFormat

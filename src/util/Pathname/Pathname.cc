@@ -14,8 +14,8 @@ const Pathname Pathname::parent("..");
 
 namespace {
 
-// A constant of its own, because the public one may not be built yet, or be gone, in static
-// initialisers and exit handlers.
+// Not the public constant, because that one may not be constructed yet in a static initialiser, or
+// may be destroyed in an exit handler.
 constexpr char kSep = '/';
 
 }  // namespace
@@ -108,9 +108,9 @@ void Pathname::stripElement() {
     }
 }
 
-// An element ".." goes with the separator behind it, the last one with the separator before it.
-// What stands around a deleted element never grows together into another one, so that one pass
-// does what deleting one by one would.
+// An element ".." is deleted with the separator after it; the last element, with the separator
+// before it. The text around a deleted element never forms another ".." element, so one pass is
+// enough.
 void Pathname::removeDotDotSlash() {
     std::string kept;
     kept.reserve(size());

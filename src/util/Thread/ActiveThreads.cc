@@ -18,8 +18,8 @@ Mutex& ActiveThreads::mutex() {
     return *_mutex;
 }
 
-// A thread that cannot be registered runs all the same: it is not counted, so nobody waits for it
-// to be struck off.
+// A thread that cannot be registered still runs. It is not counted, and so not removed when it
+// ends.
 bool ActiveThreads::add(Thread::Gate& gate) {
     _current = &gate;
     bool registered = false;

@@ -6,18 +6,19 @@
 
 inline namespace korvex {
 
-// Which workers there are, and which of them the calling thread is.
+// Counts the workers, and finds the one of the calling thread.
 class ActiveThreads {
   public:
-    // Registers the calling thread as the one of that gate, once; it is struck off when it ends.
-    // False when it cannot be counted. It is then known as that one until forgetCurrent().
+    // Registers the calling thread as that of the gate, once; it is removed when it ends. False if
+    // it cannot be counted. In both cases current() returns the gate until forgetCurrent() is
+    // called.
     static bool add(Thread::Gate& gate);
     // The calling thread's gate, or null.
     static Thread::Gate* current() { return _current; }
     // The calling thread's gate may go.
     static void forgetCurrent() { _current = nullptr; }
 
-    // For the length of a fork: this one's lock and the gates'.
+    // Holds this object's lock and that of the gates, during a fork.
     static void takeLocks();
     static void freeLocks();
 

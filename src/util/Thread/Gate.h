@@ -7,9 +7,8 @@
 
 inline namespace korvex {
 
-// What a Thread object and its operating-system thread share: whichever ends later finds it whole.
-// The thread learns from it alone what it is called and whether its object is still there, and
-// waits in it for go().
+// What a Thread object and its operating-system thread share. It exists until both have ended. From
+// it the thread gets its name, learns whether its object still exists, and waits in it for go().
 class KORVEX_HIDDEN Thread::Gate : public std::enable_shared_from_this<Thread::Gate> {
   public:
     // The name is not copied.
@@ -19,15 +18,16 @@ class KORVEX_HIDDEN Thread::Gate : public std::enable_shared_from_this<Thread::G
     // The object; null once it is gone.
     Thread* thread() const { return _thread.load(std::memory_order_acquire); }
 
-    // Lets the waiting thread run its main(). A failed assertion when it is open already.
+    // Lets the waiting thread run main(). A failed assertion if it is already open.
     void open();
-    // The object is going. A thread that has not passed the gate yet is sent home, even when the
-    // gate was opened.
+    // Says that the object is being destroyed. A thread that has not passed the gate yet ends
+    // without running main(), even if the gate was opened.
     void abandon();
-    // Waits; the object whose main() is to be run, null for a thread that was sent home.
+    // Waits. Returns the object whose main() is to be run, or null if the thread must end without
+    // it.
     Thread* pass();
 
-    // One lock for all gates: they are used once a thread.
+    // One lock for all gates: each thread uses its gate only once.
     static Mutex& readyToRunLock();
 
   private:

@@ -43,7 +43,8 @@ std::size_t InThreadActorQueue::runQueued() {
     for (std::size_t count = 0; count < atTheCall; ++count) {
         InThreadActor* const actor = takeFirst();
         if (actor == nullptr) return count;  // another thread runs the queue too
-        // An actor nobody waits for may delete itself in its callback: not a look at it after that.
+        // An actor that nobody waits for may delete itself in its callback. So it is not used
+        // afterwards.
         if (!actor->_wantWake) {
             actor->callback();
         } else {
@@ -65,7 +66,7 @@ std::size_t InThreadActorQueue::queued() {
 
 bool InThreadActorQueue::waitForWork(unsigned int timeoutSecs) {
     ScopedMutex lock(_mutex);
-    // One deadline for all waits: a wake-up without cause does not begin the time anew.
+    // One deadline for all waits: a spurious wake-up does not start the time again.
     const Deadline deadline(timeoutSecs);
     while (_first == nullptr && _submitted.waitUntil(_mutex, deadline)) {
     }

@@ -23,8 +23,8 @@ std::atomic<bool> main_thread_created{false};
 // Set up by the main thread's object; the attributes of every thread created afterwards.
 pthread_attr_t s_threadAttr;
 
-// A child of fork(2) has none of the threads that would free these. What fails under them is
-// logged, so they come before the logging system's.
+// A child of fork(2) has none of the threads that would unlock these locks. Failures under them are
+// logged, so they come before the locks of the logging system.
 KORVEX_REGISTERS_THREAD_LOCKS void keepLocksThroughForks() {
     pthread_atfork(&ActiveThreads::takeLocks, &ActiveThreads::freeLocks, &ActiveThreads::freeLocks);
 }
@@ -40,8 +40,8 @@ void setStackSize(std::size_t bytes) {
 
 }  // namespace
 
-// What a new operating-system thread is given. Not the Thread object: that may be gone before the
-// thread reads it.
+// The argument of a new operating-system thread. It is not the Thread object, because that may be
+// destroyed before the thread reads it.
 struct KORVEX_HIDDEN Thread::Start {
     std::shared_ptr<Gate> gate;
 };
@@ -68,7 +68,7 @@ void Thread::start() {
     auto arg = std::make_unique<Start>(Start{_gate});
     const int rval = pthread_create(&_token._token, &s_threadAttr, &Thread::callMain, arg.get());
     checkPtRes("pthread_create", rval);
-    if (rval != 0) return;  // with checking off: there is no thread, and none to join
+    if (rval != 0) return;  // with checking off: there is no thread to join
     static_cast<void>(arg.release());
     _created = true;
 }

@@ -4,8 +4,8 @@
 
 inline namespace korvex {
 
-// Whether failed thread-library calls throw. Relaxed accesses do: it guards no other data, and is
-// written once, at the end of the process.
+// Whether failed calls of the thread library throw. Relaxed accesses are enough: it guards no other
+// data, and is written once, at the end of the process.
 extern std::atomic<bool> checkThreadErrors;
 
 }  // namespace korvex

@@ -18,7 +18,7 @@ Logger& threadLogger() {
 
 namespace {
 
-// Makes the logger exist, and wait for its channel, from start-up on.
+// Creates the logger at start-up, so that it is bound when logging is initialised.
 [[maybe_unused]] const Logger& builtAtStartUp = threadLogger();
 
 }  // namespace

@@ -11,8 +11,8 @@ void RecursiveMutex::claim() {
     _owner_count = 1;
 }
 
-// _mutex stays held from the first lock to the last unlock, which no analysis of single functions
-// follows.
+// _mutex is held from the first lock to the last unlock. An analysis of single functions cannot
+// follow that.
 bool RecursiveMutex::tryLock() KORVEX_NO_THREAD_SAFETY_ANALYSIS {
     if (_mutex.tryLock()) {
         claim();

@@ -6,7 +6,7 @@ inline namespace korvex {
 
 namespace {
 
-// A destructor's work: what it throws must not meet an exception that is on its way already.
+// For use in a destructor: it must not throw while another exception propagates.
 template <class Work>
 void unlessUnwinding(int exceptionsBefore, Work work) {
     try {

@@ -4,7 +4,7 @@
 
 inline namespace korvex {
 
-// Where threads and locks report.
+// The logger of threads and locks.
 Logger& threadLogger();
 
 }  // namespace korvex

@@ -2,8 +2,8 @@
 
 inline namespace korvex {
 
-// With checking off a key that could not be made is remembered, so that nothing touches the key of
-// somebody else that happens to have its number.
+// With checking off, a key may not have been created. That is remembered, so that a key of other
+// code with the same number is not used.
 TSP_Implementor::TSP_Implementor(void (*cleanup)(void*)) : _cleanup_fn(cleanup) {
     const int rval = pthread_key_create(&_key, cleanup);
     checkPtRes("pthread_key_create", rval);

@@ -30,7 +30,7 @@ bool readSeconds(const char*& p, Millis& res) {
     return fits;
 }
 
-// Adds the fraction behind a consumed '.'. False when the sum is too large.
+// Adds the fraction after the '.', which was consumed. False if the sum is too large.
 bool addFraction(const char*& p, Millis& res) {
     constexpr int kept = 4;
     unsigned fraction = 0;  // in units of 100 microseconds

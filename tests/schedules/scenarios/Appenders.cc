@@ -1,5 +1,8 @@
 #include <korvex/util/Logger.h>
 
+#include <sys/resource.h>
+
+#include <csignal>
 #include <memory>
 
 #include "points/Clock.h"
@@ -62,6 +65,59 @@ std::string checkRotated(const Remains& remains) {
         all += remains.file(name);
     if (!remains.file("log").empty()) return "the log was not rotated";
     return compare("the log with its backups", Remains::lines(all), {"one", "two", "three"});
+}
+
+// Lines of four bytes, of which the third one passes the limit: never more in a file than that.
+void limited() {
+    configure("rootCategory=INFO,A\n" + kFile +
+              "appender.A.maxFileSize=8\nappender.A.maxBackupIndex=5\n");
+    Logger logger("test");
+    logger.info("one");
+    Parallel threads{[&] {
+                         logger.info("two");
+                         logger.info("six");
+                     },
+                     [&] { logger.info("ten"); }};
+    logger.info("end");
+    threads.join();
+}
+
+std::string checkLimited(const Remains& remains) {
+    std::string all;
+    for (const char* name : {"log", "log.1", "log.2"})
+        all += remains.file(name);
+    if (remains.file("log.1").size() != 12) return "the backup is not what passes the limit";
+    return compare("the log with its backups", Remains::lines(all),
+                   {"one", "two", "six", "ten", "end"});
+}
+
+// The system lets nobody write more than sixty bytes into a file: the second line is cut, and as
+// the limit is passed then, the file is rotated.
+std::string filled(char c) {
+    return std::string(40, c);
+}
+
+void cut() {
+    configure("rootCategory=INFO,A\n" + kFile +
+              "appender.A.maxFileSize=50\nappender.A.maxBackupIndex=5\n");
+    std::signal(SIGXFSZ, SIG_IGN);
+    const rlimit sixty{60, 60};
+    require(setrlimit(RLIMIT_FSIZE, &sixty) == 0, "no limit of file sizes");
+    Logger logger("test");
+    logger.info(filled('1'));
+    Parallel threads{[&] { logger.info(filled('2')); }};
+    logger.info(filled('3'));
+    threads.join();
+}
+
+std::string checkCut(const Remains& remains) {
+    const std::string log = remains.file("log");
+    if (log != filled('2') + "\n" && log != filled('3') + "\n") return "the log holds " + log;
+    const char lost = log[0] == '2' ? '3' : '2';
+    if (remains.file("log.1") != filled('1') + "\n" + std::string(19, lost))
+        return "the backup holds " + remains.file("log.1");
+    return compare("standard error", Remains::lines(remains.err),
+                   {"CRIT - Error writing to \"log\": File too large"});
 }
 
 // The file is moved away; six seconds later that must be noticed, and no line be lost.
@@ -134,6 +190,8 @@ const Register registered{
     {"appender-two-threads", &twoThreadsOneFile, &checkThree},
     {"appender-two-channels", &twoChannels, &checkTwoChannels},
     {"appender-rotated", &rotated, &checkRotated},
+    {"appender-limited", &limited, &checkLimited},
+    {"appender-line-cut", &cut, &checkCut},
     {"appender-moved-away", &movedAway, &checkMoved},
     {"appender-one-fails", &oneFails, &checkOneFails},
     {"channel-level-changed", &levelChanged, &checkThree},

@@ -162,6 +162,24 @@ std::string checkRotating(const Remains& remains) {
     return compare("the log with its backups", Remains::lines(all), {"parent", "child"});
 }
 
+// While others are writing to the open file. The child's line passes the limit.
+void besideWriters() {
+    configure(
+        "rootCategory=INFO,A\nappender.A=File\nappender.A.fileName=log\n"
+        "appender.A.maxFileSize=20\nappender.A.maxBackupIndex=5\n");
+    Logger logger("test");
+    logger.info(std::string("first"));
+    Parallel threads{[&] { logger.info(std::string("parent")); }};
+    inForkedChild([&] { logger.info(std::string("child's one")); });
+    threads.join();
+}
+
+std::string checkBesideWriters(const Remains& remains) {
+    return compare("the log with its backup",
+                   Remains::lines(remains.file("log") + remains.file("log.1")),
+                   {"first", "parent", "child's one"});
+}
+
 // A handler that a static initialiser of the process registered before the library's own.
 Logger* handlersLogger = nullptr;
 
@@ -236,6 +254,7 @@ const Register registered{
     {"fork-printf", &printf, &checkPrintf},
     {"fork-beside-initialize", &besideInitialize, &checkStderr},
     {"fork-rotating", &rotating, &checkRotating},
+    {"fork-beside-writers", &besideWriters, &checkBesideWriters},
     {"fork-error-texts", &errorTexts, &checkErrorTexts},
     {"fork-failing", &failing, &checkFailing},
     {"fork-failing-early", &failingEarly, &checkFailingEarly},

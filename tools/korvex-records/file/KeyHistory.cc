@@ -1,34 +1,35 @@
 #include "file/KeyHistory.h"
 
+#include <cstdint>
 #include <cstring>
 #include <functional>
 
 KeyHistory::KeyHistory() : _index(0, Hash{this}, Equal{this}) {}
 
-std::size_t KeyHistory::Hash::operator()(std::uint64_t at) const {
+std::size_t KeyHistory::Hash::operator()(std::size_t at) const {
     return std::hash<std::string_view>()(owner->keyAt(at));
 }
 
-bool KeyHistory::Equal::operator()(std::uint64_t a, std::uint64_t b) const {
+bool KeyHistory::Equal::operator()(std::size_t a, std::size_t b) const {
     return owner->keyAt(a) == owner->keyAt(b);
 }
 
-std::string_view KeyHistory::keyAt(std::uint64_t at) const {
+std::string_view KeyHistory::keyAt(std::size_t at) const {
     std::uint32_t size = 0;
     std::memcpy(&size, _bytes.data() + at, sizeof size);
     return std::string_view(_bytes).substr(at + sizeof size, size);
 }
 
-std::uint64_t KeyHistory::append(std::string_view key) {
+std::size_t KeyHistory::append(std::string_view key) {
     const auto size = static_cast<std::uint32_t>(key.size());
-    const std::uint64_t at = _bytes.size();
+    const std::size_t at = _bytes.size();
     _bytes.append(reinterpret_cast<const char*>(&size), sizeof size);
     _bytes.append(key);
     return at;
 }
 
 void KeyHistory::indexAll() {
-    for (std::uint64_t at = 0; at < _bytes.size(); at += sizeof(std::uint32_t) + keyAt(at).size())
+    for (std::size_t at = 0; at < _bytes.size(); at += sizeof(std::uint32_t) + keyAt(at).size())
         _index.insert(at);
 }
 

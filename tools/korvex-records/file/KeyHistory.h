@@ -1,6 +1,6 @@
 #pragma once
 
-#include <cstdint>
+#include <cstddef>
 #include <string>
 #include <string_view>
 #include <unordered_set>
@@ -19,19 +19,19 @@ class KeyHistory {
   private:
     struct Hash {
         const KeyHistory* owner;
-        std::size_t operator()(std::uint64_t at) const;
+        std::size_t operator()(std::size_t at) const;
     };
     struct Equal {
         const KeyHistory* owner;
-        bool operator()(std::uint64_t a, std::uint64_t b) const;
+        bool operator()(std::size_t a, std::size_t b) const;
     };
 
-    std::string_view keyAt(std::uint64_t at) const;
-    std::uint64_t append(std::string_view key);
+    std::string_view keyAt(std::size_t at) const;
+    std::size_t append(std::string_view key);
     void indexAll();
 
     std::string _bytes;  // each key behind its length
-    std::uint64_t _last = 0;
+    std::size_t _last = 0;
     bool _ascending = true;
-    std::unordered_set<std::uint64_t, Hash, Equal> _index;  // empty while the keys ascend
+    std::unordered_set<std::size_t, Hash, Equal> _index;  // empty while the keys ascend
 };

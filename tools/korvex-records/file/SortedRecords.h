@@ -1,5 +1,6 @@
 #pragma once
 
+#include <cstddef>
 #include <cstdint>
 #include <string>
 #include <string_view>
@@ -11,7 +12,7 @@
 class SortedRecords {
   public:
     struct Record {
-        std::uint64_t key = 0;  // where it begins among the keys
+        std::size_t key = 0;  // where it begins among the keys
         std::uint32_t keySize = 0;
         std::uint32_t valueSize = 0;
         std::uint64_t valueAt = 0;  // in the file

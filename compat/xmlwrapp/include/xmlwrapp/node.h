@@ -1,5 +1,5 @@
 #pragma once
-// #include_next is no standard C++, which this lets a strict compiler pass over.
+// #include_next is not standard C++; this silences the warning of a strict compiler.
 #pragma GCC system_header
 
 // For programs that ask for xmlwrapp's header by its own name: xmlwrapp's, if it is there.

@@ -9,12 +9,12 @@ KORVEX_NAMESPACE(korvex) {
 
 class Logger;
 
-// The exception of framework components that have become unusable; what() is the message.
+// Thrown by a framework component that has become unusable. what() is the message.
 class ComponentException : public std::runtime_error {
   public:
     // Logs nothing.
     explicit ComponentException(const std::string& message);
-    // Logs the message at error level as it is built, so once, where it is thrown.
+    // Also logs the message at level ERROR, when it is constructed: once, where it is thrown.
     ComponentException(Logger& logger, const std::string& message);
     ComponentException(const ComponentException&) = default;
     ComponentException& operator=(const ComponentException&) = default;

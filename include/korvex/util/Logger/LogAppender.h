@@ -4,11 +4,7 @@
 #include <korvex/util/FileDescriptor.h>
 #include <korvex/util/Logger/LogLevel.h>
 #include <korvex/util/Pathname.h>
-#include <korvex/util/ThreadObj.h>
 
-#include <sys/types.h>
-
-#include <atomic>
 #include <cstdint>
 #include <string>
 #include <vector>
@@ -19,50 +15,51 @@ class LogFormat;
 class LogMsgMetadata;
 
 // One destination of messages: a file that is rotated by size, or an open descriptor (standard
-// error). Appenders that find() made live until the process ends and may be shared by channels.
+// error). Appenders made by find() live until the process ends. Several channels may share one.
 //
-// write() may be called from any thread; everything else belongs to start-up, before other threads
+// write() may be called from any thread. Call everything else during start-up, before other threads
 // log.
 class LogAppender {
   public:
-    // An appender without descriptor, file, limits or layout.
+    // An appender without descriptor, file, limits or layout. Throws std::bad_alloc.
     LogAppender();
     // An appender that writes to an open descriptor, which it neither owns nor closes, with a
-    // layout that must outlive it; null: the root appender's.
+    // layout that must outlive it; null: the root appender's. Throws std::bad_alloc.
     explicit LogAppender(FileDescriptor fd, const LogFormat* layout = nullptr);
     LogAppender(const LogAppender&) = delete;
     LogAppender& operator=(const LogAppender&) = delete;
     // Closes the file, if it opened one.
     ~LogAppender() noexcept;
 
-    // "rootAppender" is the process's own appender on standard error; any other name the appender
-    // registered under it. When there is none, a new one is made if `create` is true, else the
-    // result is null. The result is never freed. Throws std::bad_alloc.
+    // The appender registered under that name. "rootAppender" is always there: it writes to
+    // standard error. If there is none of that name, a new one is made when `create` is true, else
+    // the result is null. The result is never freed. Throws std::bad_alloc.
     static LogAppender* find(const std::string& name, bool create);
 
-    // Applies one attribute of the configuration; false, and nothing changed, when the attribute
-    // is unknown or the value unacceptable.
+    // Applies one attribute of the configuration. False, with nothing changed, if the attribute is
+    // unknown or the value invalid.
     //
     //   fileName                  any path; a leading "${KORVEX_HOME}" becomes korvexHome unless
     //                             that is empty. Closes the file in use; a descriptor
-    //                             that was handed in is let go, not closed.
+    //                             given to the constructor is dropped, not closed.
     //   maxFileSize               bytes beyond which the file is rotated; 0: never. isValidUint().
     //   maxBackupIndex            how many numbered backups are kept. isValidUint(); a number
     //                             beyond 32 bits counts as 4294967295.
     //   layout                    "BasicLayout", "SimpleLayout" or "PatternLayout"
     //   layout.ConversionPattern  a LogFormat pattern
     //
-    // The last line that sets the layout wins; "PatternLayout" sets none. The root appender stays
-    // on standard error whatever it is told: it opens, closes and rotates nothing.
+    // The last call that sets the layout wins; "PatternLayout" sets none. The root appender always
+    // writes to standard error: it opens, closes and rotates nothing.
     bool setAttribute(const std::string& aname, const char* val, const Pathname& korvexHome);
 
-    // Completes the configuration once all attributes are known: the root appender's layout where
-    // none was given, standard error where there is no file, warnings (naming the appender `name`)
-    // for limits that cannot work, and a test open that creates the file and reports a bad path.
+    // Completes the configuration when all attributes are known: without a layout it takes that of
+    // the root appender, without a file it takes standard error. Logs warnings (with the name
+    // `name`) for limits that cannot work. Opens the file once for a test, which creates it and
+    // reports a bad path.
     void finalSetup(const char* name);
 
-    // finalSetup() without the test open and without logging: says what is to be said of the
-    // appender ("has no filename, assuming stderr"), in order. A second call finds nothing left.
+    // finalSetup() without the test open and without logging: returns the warnings ("has no
+    // filename, assuming stderr"), in order. A second call returns none.
     std::vector<const char*> settle();
 
     // What it is configured to do. It writes to a file when it has a name for one and is not the
@@ -73,16 +70,20 @@ class LogAppender {
     std::uint32_t maxBackupIndex() const { return _maxBackupIndex; }
     const LogFormat& layout() const;  // the root appender's until one is set
 
-    // Lays the message out and writes it with one write(2), after that rotating a file that has
-    // grown beyond its limit. Every five seconds of message time the file's identity is checked
-    // (device and inode), so that a file moved away is left and a new one made. Failures, a line
-    // that could be written only in part among them, are reported through LogFormat::internal once
-    // the lock is released; the message is lost then, and the next one opens the file again. What
-    // was written of such a line counts towards the limit. Takes no notice of a lock that fails.
-    // Throws what LogFormat::apply throws.
+    // Formats the message by the layout, writes it with one write(2), then rotates the file if it
+    // has grown beyond its limit. Every five seconds of message time, checks by device and inode
+    // whether the open file is still the one of that name; if not, closes it and opens a new one.
+    // Failures, partly written lines included, are reported through LogFormat::internal when the
+    // lock is free. Such a message is lost, and the next one opens the file again. The part that
+    // was written of such a line counts towards the limit. If a lock cannot be taken, it writes
+    // without it. Throws what LogFormat::apply throws.
+    //
+    // Several threads may write to a regular file at the same time; the kernel puts their lines in
+    // order. The line that passes the limit is the last one of its file.
     void write(const LogMsgMetadata& mdata, const std::string& msg);
 
   private:
+    class Output;
     class Report;
 
     friend class LogChannel;
@@ -90,30 +91,13 @@ class LogAppender {
 
     // write(), and whether all of the line was written.
     bool tryWrite(const LogMsgMetadata& mdata, const std::string& msg);
-    bool writeLine(const std::string& line, long long now, Report& report) KORVEX_REQUIRES(_mutex);
-    void checkIdentity(long long now) KORVEX_REQUIRES(_mutex);
-    bool openFile(Report& report) KORVEX_REQUIRES(_mutex);
-    bool openAndInitFile(long long now, Report& report) KORVEX_REQUIRES(_mutex);
-    void rotateFile(long long now, Report& report) KORVEX_REQUIRES(_mutex);
-    void closeFd() KORVEX_REQUIRES(_mutex);
-    void filenameWithSuffix(Pathname& out, unsigned suffix) const;
 
-    Mutex _mutex;  // from the identity check to the rotation
-    FileDescriptor _fd KORVEX_GUARDED_BY(_mutex);
     Pathname _filename;                 // empty: no file, only the descriptor
     std::int64_t _maxSize = 0;          // bytes; 0: never rotate
     std::uint32_t _maxBackupIndex = 0;  // number of backups kept
     const LogFormat* _fmt = nullptr;    // not owned; layouts are shared and never freed
-    // Bytes in the file, as far as known.
-    std::int64_t _curSize KORVEX_GUARDED_BY(_mutex) = 0;
-    // Identity of the open file: an inode number alone is unique on one device only.
-    ino_t _inodeNum KORVEX_GUARDED_BY(_mutex) = 0;
-    dev_t _device KORVEX_GUARDED_BY(_mutex) = 0;
-    // Seconds: when that identity was confirmed.
-    long long _lastCheck KORVEX_GUARDED_BY(_mutex) = 0;
-    // Whether write() holds the lock just now: a hint to those about to wait for it.
-    std::atomic<bool> _writing{false};
-    bool _registered = false;  // made by find(), so the lock is taken before a fork
+    bool _registered = false;           // made by find(), so the lock is taken before a fork
+    Output* const _output;              // owned: the descriptor, and who may write to it
 };
 
 }  // KORVEX_NAMESPACE(korvex)

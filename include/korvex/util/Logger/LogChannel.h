@@ -12,53 +12,53 @@ KORVEX_NAMESPACE(korvex) {
 class LogAppender;
 class LogMsgMetadata;
 
-// What a Logger writes to: a minimum level and the appenders that receive every message that
-// passes it; a channel without appenders writes to the root appender (standard error).
+// What a Logger writes to: a minimum level and a list of appenders. Every message of that level or
+// above goes to each appender. A channel without appenders writes to the root appender (standard
+// error).
 //
-// write(), passes() and find() may be called from any thread, and so may changeLevel(); setConfig()
-// belongs to start-up, before other threads log. Channels that find() made live until the process
-// ends.
+// write(), passes(), find() and changeLevel() may be called from any thread. Call setConfig()
+// during start-up, before other threads log. Channels made by find() live until the process ends.
 class LogChannel {
   public:
-    // INFO and above, no appenders.
+    // Accepts INFO and above; has no appenders.
     LogChannel();
     // Copies the level and the list of appenders (not the appenders).
     LogChannel(const LogChannel& other);
     LogChannel& operator=(const LogChannel&) = delete;
     ~LogChannel() = default;
 
-    // The channel registered under the name. When there is none: a new one that starts as a copy
-    // of the root channel as it is now, if `create` is true, else the root channel. Never null.
-    // Names are flat: "a.b" has no parent "a". Throws std::bad_alloc.
+    // The channel registered under that name. If there is none: with `create`, a new one that
+    // starts as a copy of the present root channel; without, the root channel. Never null. Names
+    // are flat: "a.b" has no parent "a". Throws std::bad_alloc.
     static LogChannel* find(const std::string& name, bool create);
     static LogChannel* find(const char* name, bool create);
 
-    // Applies a configuration value: words separated by blanks, tabs and commas, each a level or
-    // an appender's name. The first appender replaces the present list. False when a word is
-    // neither; the other words are applied all the same.
+    // Applies a configuration value: words separated by blanks, tabs and commas. Each is a level or
+    // the name of an appender. The first appender replaces the present list. False if a word is
+    // neither; the other words are applied nevertheless.
     bool setConfig(const char* cstr);
 
-    // Sets the minimum from a level's name in upper case. False, and nothing changed, for any
-    // other word.
+    // Sets the minimum to the level with that name in upper case. For any other word the result is
+    // false and nothing changes.
     bool changeLevel(const std::string& word);
 
-    // Whether a message of this level is wanted. One comparison.
+    // Whether the channel accepts messages of this level. One comparison.
     bool passes(LogLevel level) const {
-        // Relaxed: the level guards no other data; a late change costs one line.
+        // Relaxed: the level guards no other data. A change that is seen late affects one line.
         return level >= minlevel.load(std::memory_order_relaxed);
     }
 
     // The minimum.
     LogLevel level() const { return minlevel.load(std::memory_order_relaxed); }
-    // Where messages go, in order; empty: to the root appender. Changed by setConfig() only.
+    // Where messages go, in order. Empty means the root appender. Only setConfig() changes it.
     const std::vector<LogAppender*>& appenders() const { return _appenders; }
 
-    // Hands the message, whatever its level, to each appender in order. Throws what
+    // Gives the message, whatever its level, to each appender in order. Throws what
     // LogAppender::write throws.
     void write(const LogMsgMetadata& mdata, const std::string& msg);
 
-    // The same, except to dont_touch and to the appenders that have failed in the report that this
-    // thread is delivering. Returns whether an appender has written all of it.
+    // The same, but skips `dont_touch`, and the appenders that failed in the report that this
+    // thread is delivering. Returns whether an appender has written the whole line.
     bool write(const LogMsgMetadata& mdata, const std::string& msg, const LogAppender* dont_touch);
 
   private:

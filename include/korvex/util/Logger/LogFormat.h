@@ -23,48 +23,49 @@ class Logger;
 //   %m message          %n newline              %% percent sign
 //   %c channel name     %p level name           %t name of the calling thread
 //   %r milliseconds since epoch_timeval()       %R the same in seconds, cut
-//   %u clock(3) in its own ticks                %d{layout} local date, see LogFormattedDate
+//   %u the value of clock(3)                    %d{layout} local date, see LogFormattedDate
 //
-// Between % and the letter: a flag (- pads with blanks after the text, 0 pads with zeros before
-// it), a minimum width, and a precision (".n") beyond which the text is cut. A text that was cut is
-// never padded. Unknown letters and unfinished conversions print nothing.
+// Between % and the letter may stand: a flag (- pads with blanks after the text, 0 pads with zeros
+// before it), a minimum width, and a precision (".n") beyond which the text is cut. A text that was
+// cut is never padded. Unknown letters and unfinished conversions print nothing.
 //
-// Immutable after construction; apply() may be called from several threads at once.
+// Immutable after construction. apply() may be called from several threads at once.
 class LogFormat {
   public:
-    // Copies and compiles the pattern. Never fails on its content; throws std::bad_alloc.
+    // Copies and compiles the pattern. Every pattern is accepted. Throws std::bad_alloc.
     explicit LogFormat(const char* pattern);
     LogFormat(const LogFormat&) = delete;
     LogFormat& operator=(const LogFormat&) = delete;
     ~LogFormat();
 
-    // Appends the line laid out from the message to `out`. A stamp before the epoch makes %r and
-    // %R very large numbers: the difference is printed as unsigned. Throws what
-    // LogFormattedDate::fmt throws, and std::bad_alloc.
+    // Appends the formatted line to `out`. If the stamp is before the epoch, %r and %R print very
+    // large numbers, because the difference is unsigned. Throws what LogFormattedDate::fmt throws,
+    // and std::bad_alloc.
     void apply(std::string& out, const LogMsgMetadata& md, const std::string& msg) const;
 
-    // The text it was made from.
+    // The text of the pattern.
     const std::string& pattern() const { return _fmt; }
 
-    // The way of every message: level test, metadata, the logger's channel; standard error when
-    // the logger is not usable yet, its channel throws, or this is a signal handler that
-    // interrupted its own thread in logging. Never throw, keep errno. The second form
-    // formats as Logger::vformat does, %m being the errno at the call, and only when the level has
-    // passed; a message whose formatting runs out of memory is dropped.
+    // What every message goes through: the test of the level, the metadata, the channel of the
+    // logger. The message goes to standard error instead if the logger is not constructed yet, if
+    // its channel throws, or in a signal handler that interrupted its own thread in logging. Never
+    // throw, keep errno. The second form formats as Logger::vformat does, after the test of the
+    // level; %m is the errno at the call. If memory for the formatting runs out, the message is
+    // dropped.
     static void do_log(Logger* logger, LogLevel level, const std::string& text) noexcept;
     static void do_log(Logger* logger, LogLevel level, const char* fmt, va_list ap) noexcept
         __attribute__((format(printf, 3, 0)));
 
-    // Logs one of the logging system's own messages on the channel "Logger". Neither `skip` (null
-    // for none) nor an appender that has failed in the report that this thread is delivering
-    // already receives it; what no appender could write goes to standard error. Never throws,
+    // Logs a message of the logging system itself on the channel "Logger". It skips the appender
+    // `skip` (null for none), and the appenders that failed in the report that this thread is
+    // delivering. If no appender could write the message, it goes to standard error. Never throws,
     // keeps errno.
     static void internal(const LogAppender* skip, LogLevel level, const char* fmt, ...) noexcept
         __attribute__((format(printf, 3, 4)));
 
-    // True when a message through `logger` must go straight to standard error: logging is not
-    // initialised and `logger` was not constructed yet (a static object of a source file whose
-    // initialisers have not run). Takes a lock before initialisation only.
+    // True if a message through `logger` must go directly to standard error: logging is not
+    // initialised, and `logger` is not constructed yet (a static object of a source file whose
+    // initialisers have not run). Takes a lock only before initialisation.
     static bool check_for_unitialized_logger(const Logger* logger);
 
   private:
@@ -92,9 +93,9 @@ class LogFormat {
     };
     class Compiler;
     class Line;
-    friend class LayoutPieces;  // lays the atoms open, for the tools
+    friend class LayoutPieces;  // shows the atoms to the tools
 
-    // Whether anybody wants such a message, and in *taker who: a channel, or null for standard
+    // Whether the message is to be written, and in *taker by whom: a channel, or null for standard
     // error.
     static bool findTaker(const Logger& logger, LogLevel level, LogChannel*& taker);
 

@@ -11,14 +11,14 @@ KORVEX_NAMESPACE(korvex) {
 class LayoutPieces;
 class LogMsgMetadata;
 
-// The broken-down local time of the one message that is being laid out, converted at most once.
-// Belongs to one thread and one message.
+// The broken-down local time of one message, converted at most once. For one thread and one
+// message.
 class CachedTm {
   public:
-    // The message's stamp as local time. The first call converts md.stamp; later calls do not look
-    // at md again. Aborts when the conversion fails, as Timeval::localtime does.
+    // The stamp of the message as local time. The first call converts md.stamp; later calls return
+    // the same result, whatever md is. Aborts if the conversion fails, as Timeval::localtime does.
     const struct tm& get(const LogMsgMetadata& md);
-    // strftime(3) of that: the length written, or 0 when `size` does not suffice.
+    // strftime(3) of that time: the length written, or 0 if `size` is too small.
     unsigned long ftime(char* buf, unsigned long size, const char* fmt, const LogMsgMetadata& md);
 
   private:
@@ -26,14 +26,17 @@ class CachedTm {
     bool _stampSet = false;
 };
 
-// A date layout, compiled once: a strftime(3) pattern extended by %l, the milliseconds in three
-// digits. Named layouts, compared exactly: "DATE" is "%d %b %Y %H:%M:%S,%l", "ISO8601" (also no
-// name, or an empty one) "%Y-%m-%d %H:%M:%S,%l", "ABSOLUTE" "%H:%M:%S,%l".
+// A date layout, compiled once: a strftime(3) pattern with one more conversion, %l, the
+// milliseconds in three digits. Some patterns have names, which are case-sensitive:
 //
-// The pattern is cut at the two characters %l without regard to what stands before them, so in
-// "%%l" the second percent sign and the l are a milliseconds conversion.
+//   "DATE"                               %d %b %Y %H:%M:%S,%l
+//   "ISO8601", an empty name or no name  %Y-%m-%d %H:%M:%S,%l
+//   "ABSOLUTE"                           %H:%M:%S,%l
 //
-// Immutable after construction; fmt() may be called from several threads at once.
+// The two characters %l are a conversion whatever stands before them: "%%l" is a percent sign and
+// the milliseconds.
+//
+// Immutable after construction. fmt() may be called from several threads at once.
 class LogFormattedDate {
   public:
     // Compiles the `len` characters at `name`, which need not end in a NUL; a null `name` means
@@ -43,9 +46,10 @@ class LogFormattedDate {
     LogFormattedDate& operator=(const LogFormattedDate&) = delete;
     ~LogFormattedDate() = default;
 
-    // Appends md's stamp, laid out, to `out`; `tm` must be fresh or have served the same md.
-    // Throws std::length_error when a piece of the pattern stays empty although it is not made of
-    // %p alone (strftime(3) cannot tell that from a buffer too small), and std::bad_alloc.
+    // Appends the stamp of md, formatted, to `out`. `tm` must be new, or used for the same md
+    // before. Throws std::bad_alloc. Throws std::length_error if a part of the pattern yields no
+    // text, unless it consists of %p only: strftime(3) returns 0 for that and for a buffer that is
+    // too small.
     void fmt(std::string& out, CachedTm& tm, const LogMsgMetadata& md) const;
 
   private:

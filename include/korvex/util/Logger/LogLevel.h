@@ -2,10 +2,9 @@
 
 #include <korvex/Export.h>
 
-// A program may well be built with -DDEBUG, or include a header that defines ERROR. The macros are
-// put aside while the enumerators are declared and come back afterwards, so that such a program
-// compiles as long as it does not name these levels itself; where it must, `LogLevel` values are
-// reachable through #undef or the numbers below.
+// A program may be built with -DDEBUG, or include a header that defines ERROR. The macros are set
+// aside while the enumerators are declared, and restored afterwards. So such a program compiles as
+// long as it does not name these levels itself. If it must, it uses #undef, or the numbers below.
 #pragma push_macro("DEBUG")
 #pragma push_macro("INFO")
 #pragma push_macro("NOTICE")
@@ -27,8 +26,9 @@
 
 KORVEX_NAMESPACE(korvex) {
 
-// How grave a message is. A message passes a channel when its level is greater than or equal to
-// the channel's minimum. Logger has no methods for NOTICE, ALERT and EMERG: they serve as minima.
+// The severity of a message. A channel accepts a message whose level is greater than or equal to
+// the channel's minimum. Logger has no methods for NOTICE, ALERT and EMERG: they are for minimums
+// only.
 enum LogLevel : int {
     DEBUG = 0,
     INFO = 1,
@@ -41,8 +41,9 @@ enum LogLevel : int {
     EMERG = 8
 };
 
-// The level's name ("DEBUG" ... "EMERG"), or "???" for any other value; its length in bytes goes
-// to *len, which must not be null. The text lives for ever. Never fails; safe from any thread.
+// The name of the level ("DEBUG" ... "EMERG"), or "???" for any other value. Stores its length in
+// bytes in *len, which must not be null. The text is never freed. Never fails. Safe from any
+// thread.
 KORVEX_EXPORT const char* loglevel2str(unsigned long* len, LogLevel level);
 
 }  // KORVEX_NAMESPACE(korvex)

@@ -14,7 +14,7 @@ namespace {
 constexpr std::size_t kSmallest = 4096;  // bytes, where the size is not known before
 constexpr std::size_t kMost = std::numeric_limits<std::size_t>::max();
 
-// One more than there should be, so that the end shows.
+// One more byte than expected, so that the end of the file is seen.
 std::size_t firstCapacity(std::FILE* file) {
     struct stat st {};
     if (fstat(fileno(file), &st) != 0 || !S_ISREG(st.st_mode)) return kSmallest;
@@ -22,7 +22,7 @@ std::size_t firstCapacity(std::FILE* file) {
     return size < kMost ? static_cast<std::size_t>(size) + 1 : kMost;
 }
 
-// False, the bytes being as they were, when there is no memory.
+// False, with the bytes unchanged, if there is no memory.
 bool resize(FileBytes& bytes, std::size_t capacity) {
     Block larger = newBlock(capacity);
     if (!larger) return false;

@@ -17,9 +17,9 @@ struct FileBytes {
     const char* end() const { return block.get() + size; }
 };
 
-// Reads a stream that was just opened, to its end. It need not be seekable. The stream is left
-// without a buffer: the exit(3) of a child that was forked meanwhile would else move the file's
-// offset back by what was read ahead, for the parent too.
+// Reads a stream that was just opened, to its end. It need not be seekable. The stream has no
+// buffer afterwards: with a buffer, the exit(3) of a child that was forked meanwhile would move the
+// file offset back, for the parent too.
 FileBytes readToEnd(std::FILE* file);
 
 }  // namespace korvex

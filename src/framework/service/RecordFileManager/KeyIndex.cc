@@ -37,7 +37,7 @@ bool hasKey(const char* slot, std::string_view key) {
 
 }  // namespace
 
-// Of eight bytes at a time, the last eight overlapping the ones before.
+// Hashes eight bytes at a time. The last eight overlap those before.
 std::size_t KeyIndex::hashOf(std::string_view key) {
     std::uint64_t word = 0;
     std::uint64_t hash = key.size();

@@ -6,9 +6,9 @@
 
 inline namespace korvex {
 
-// Finds records by the hash of their key. A record lies within a few slots of where its hash
-// points, or it is not here: so keys that somebody made to collide cost a search elsewhere and no
-// more, and the hash needs no secret.
+// Finds records by the hash of their key. A record is within a few slots of the place of its hash,
+// or it is not in the index at all. So colliding keys, even if made on purpose, cost only a search
+// in the ordered table, and the hash needs no secret.
 class KeyIndex {
   public:
     static std::size_t hashOf(std::string_view key);
@@ -19,16 +19,17 @@ class KeyIndex {
     };
     Answer find(std::string_view key) const;
 
-    // Whether one more can be entered; else all must be, again, behind a reset.
+    // Whether one more record can be entered. If not, reset the index and enter all records again.
     bool hasRoom() const { return 2 * (_used + 1) <= _slots.size(); }
-    // Empty, with room for so many records. Throws std::bad_alloc, the index being as it was.
+    // Makes the index empty, with room for that many records. Throws std::bad_alloc; then the index
+    // is unchanged.
     void reset(std::size_t records);
-    // Asks for the memory that an insert will look at, which shortens loading a million records by
-    // a third.
+    // Prefetches the memory that an insert will use. That makes loading a million records a third
+    // faster.
     void prefetch(std::size_t hash) const;
     // Enters a record whose key has that hash and is not there; there must be room.
     void insert(std::size_t hash, const char* record);
-    // The record with this key is another one now.
+    // Replaces the record with this key by another one.
     void replace(std::string_view key, const char* record);
     void erase(std::string_view key);
 

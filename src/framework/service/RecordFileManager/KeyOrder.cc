@@ -17,7 +17,7 @@ bool isBefore(const char* record, std::string_view key) {
 }  // namespace
 
 KeyOrder::Place KeyOrder::lowerBound(std::string_view key) const {
-    // Files lie in key order, so while loading the place is the end.
+    // Files are in key order, so while a file is loaded the place is the end.
     if (_chunks.empty() || isBefore(_chunks.back().back(), key)) return {_chunks.size(), 0};
     const auto chunk =
         std::lower_bound(_chunks.begin(), _chunks.end(), key,
@@ -48,7 +48,7 @@ void KeyOrder::insert(Place place, const char* record) {
     chunk.insert(chunk.begin() + static_cast<std::ptrdiff_t>(place.index), record);
 }
 
-// Into two halves.
+// Splits a chunk into two halves.
 void KeyOrder::split(std::size_t chunk) {
     const auto middle = _chunks[chunk].begin() + kChunk / 2;
     _chunks.emplace(_chunks.begin() + static_cast<std::ptrdiff_t>(chunk) + 1, middle,

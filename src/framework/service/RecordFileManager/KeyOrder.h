@@ -14,13 +14,13 @@ class KeyOrder {
         std::size_t chunk;
         std::size_t index;
     };
-    // Of the first record whose key is not before this one.
+    // The place of the first record whose key is not before this one.
     Place lowerBound(std::string_view key) const;
     bool isEnd(Place place) const { return place.chunk == _chunks.size(); }
     const char* at(Place place) const { return _chunks[place.chunk][place.index]; }
     Place next(Place place) const;
 
-    // Before the record at that place. Throws std::bad_alloc, the order being as it was.
+    // Inserts before the record at that place. Throws std::bad_alloc; then the order is unchanged.
     void insert(Place place, const char* record);
     void replace(Place place, const char* record) { _chunks[place.chunk][place.index] = record; }
     void erase(Place place);

@@ -20,7 +20,7 @@ std::string_view upToNul(std::string_view text) {
     return text.substr(0, strnlen(text.data(), text.size()));
 }
 
-// No block, and no message, where the file cannot be opened.
+// Without a block, and without a message, if the file cannot be opened.
 FileBytes bytesOf(const Pathname& file) {
     const Stream stream(file.fopen("rb"));
     if (!stream) return FileBytes();
@@ -63,7 +63,7 @@ void Loader::take(const RecordReader& read) {
     } else if (_prefix.empty() && key.size() == read.key().size() && !read.valueIsCut()) {
         enterWhereItLies(read);
     } else {
-        // Of a file of which not all is wanted the bytes are not kept.
+        // If only some records of a file are wanted, its bytes are not kept.
         enterCopy(read, key);
     }
 }
@@ -104,7 +104,7 @@ void RecordFileManager::load(const Pathname& file, const std::string& prefix,
     Loader loader(_state->records, std::move(bytes), prefix, version);
     while (reader.next())
         loader.take(reader);
-    // A whole file without a version is let pass.
+    // A complete file without a version is accepted.
     if (reader.endedInAValue() && version.empty()) {
         throw ComponentException(storeLogger(),
                                  "No version string found in hash db.  File has been modified or "

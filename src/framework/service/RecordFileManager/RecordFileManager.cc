@@ -23,7 +23,7 @@ Logger& storeLogger() {
 
 namespace {
 
-// Makes the logger exist, and wait for its channel, from start-up on.
+// Creates the logger at start-up, so that it is bound when logging is initialised.
 [[maybe_unused]] const Logger& builtAtStartUp = storeLogger();
 
 // For a caller to free with delete[].
@@ -55,8 +55,9 @@ RecordFileManager::RecordFileManager() : _state(new State) {}
 
 namespace {
 
-// A child of fork(2) would find the store's lock as another thread held it, and nobody to free it.
-// The logging system's locks may be taken under this one, so before a fork this one comes first.
+// In a child of fork(2), the lock of the store would stay locked if another thread held it. So it
+// is taken before a fork. It comes before the locks of the logging system, because these may be
+// taken under it.
 Mutex* storeLock = nullptr;  // null: there is no store yet
 thread_local bool takenForFork = false;
 

@@ -22,7 +22,7 @@ bool RecordReader::readKey() {
     _record = _at;
     const std::string_view length = take(kLengthBytes);
     if (length.size() < kLengthBytes) {
-        // Nothing at all, at the end, is how a whole file ends.
+        // No byte at all: the end of a complete file.
         if (!length.empty() || !_metTheEnd) {
             storeLogger().error("Short read for key length, record file may be corrupt.");
         }

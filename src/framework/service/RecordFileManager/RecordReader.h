@@ -7,8 +7,8 @@
 
 inline namespace korvex {
 
-// Walks the records of a file in memory. A length is believed only as far as the file has bytes;
-// what is missing is reported, but a value's end only by who is going to use it.
+// Iterates over the records of a file in memory. A length is trusted only as far as the file has
+// bytes. Missing bytes are reported, except those of a value: its user reports them.
 class RecordReader {
   public:
     explicit RecordReader(const FileBytes& bytes)
@@ -23,7 +23,7 @@ class RecordReader {
     // As the file says. There may be less of it.
     std::uint32_t valueSize() const { return _valueSize; }
     bool valueIsCut() const { return _value.size() < _valueSize; }
-    // The end came within the last record's value.
+    // Whether the file ended within the value of the last record.
     bool endedInAValue() const { return valueIsCut() && _metTheEnd; }
 
   private:

@@ -37,7 +37,7 @@ bool writeVersion(StagedFile& file) {
                        [&file](const void* p, std::size_t n) { return file.write(p, n); });
 }
 
-// Those that lie together are written together.
+// Fields that are adjacent in memory are written together.
 bool writeRecords(StagedFile& file, const RecordTable& table) {
     const char* begin = nullptr;
     const char* end = nullptr;
@@ -78,7 +78,7 @@ bool RecordFileManager::save() const {
     if (_state->file.empty()) {
         throw ComponentException(storeLogger(), "Tried to write to db without setting filename.");
     }
-    umask(066);                         // the records are nobody else's business; never set back
+    umask(066);                         // only the owner may read the records; never set back
     std::optional<ErrnoKeeper> keeper;  // of the failed call's, through the file's closing
     StagedFile file(_state->file);
     if (!file) {
@@ -89,7 +89,7 @@ bool RecordFileManager::save() const {
             _state->file.c_str(), errno);
         return false;
     }
-    // A full disk shows at the closing at the latest.
+    // If the disk is full, the close fails at the latest.
     if (writeVersion(file) && writeRecords(file, _state->records.table()) && file.close())
         return true;
     keeper.emplace();

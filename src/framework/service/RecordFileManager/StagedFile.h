@@ -9,20 +9,19 @@
 
 inline namespace korvex {
 
-// A file that is being written from its beginning. Its stream has no buffer: exit(3) writes out
-// what it finds in any stream's buffer, while another thread is filling it as well as in a child of
-// fork(2), which has a copy of it. What is written is staged here, where exit does not look.
+// A file that is written from its beginning. Its stream has no buffer, because exit(3) writes the
+// buffers of all streams: also while another thread fills one, and in a child of fork(2), which has
+// a copy. The bytes are staged in this object instead, which exit does not write.
 class StagedFile {
   public:
     // Opens the file; on failure false, and errno is fopen(3)'s.
     explicit StagedFile(const Pathname& file);
     explicit operator bool() const { return _file != nullptr; }
 
-    // False when the file did not take all that it was given; errno tells why. It then holds a
-    // beginning of what was written; what is still staged is dropped.
+    // False if not all bytes could be written; errno has the reason. The file then holds the first
+    // part of them, and the staged bytes are dropped.
     bool write(const void* p, std::size_t n);
-    // Hands on what is staged and closes the file. False as from write(), or when the closing
-    // fails.
+    // Writes the staged bytes and closes the file. False as for write(), or if the close fails.
     bool close();
 
   private:

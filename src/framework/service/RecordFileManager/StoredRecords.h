@@ -10,9 +10,9 @@
 
 inline namespace korvex {
 
-// The records and the memory in which they lie: what was put has a block of its own, what was
-// loaded stays in its file's. A replaced value is kept, because callers are known to hold on to
-// values longer than the store does; it stays reachable from here.
+// The records and their memory. A record that was put has a block of its own; a record that was
+// loaded is in the block of its file. A replaced value is kept, because some callers use values
+// longer than the store does. It stays reachable from here.
 class StoredRecords {
   public:
     struct KeptFile {
@@ -21,7 +21,7 @@ class StoredRecords {
     };
 
     const RecordTable& table() const { return _table; }
-    // What throws std::bad_alloc leaves the records as they were.
+    // Calls that throw std::bad_alloc leave the records unchanged.
     void put(Block record);
     // Keeps a file's bytes, for records to lie in. They are freed with the last of these.
     KeptFile& keep(FileBytes bytes);
@@ -34,7 +34,7 @@ class StoredRecords {
     using KeptFiles = std::map<const char*, KeptFile, std::less<>>;  // by their first byte
 
     void enter(const char* record);
-    // The file in whose bytes a record lies; the end where it has a block of its own.
+    // The file that holds a record; the end iterator if the record has a block of its own.
     KeptFiles::iterator fileOf(const char* record);
 
     RecordTable _table;

@@ -1,0 +1,2 @@
+echo 'rootCategory=INFO' > signals.cfg
+signals
