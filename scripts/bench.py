@@ -17,6 +17,7 @@ import subprocess
 import sys
 
 import bench_plots
+import bench_quiet
 import bench_report
 from bench_rows import BIN, COUNTED, LINEAR, OUT, ROOT, ROWS, contestants, start_configuration
 
@@ -66,7 +67,8 @@ def measure(row, repeat):
     for turn in range(repeat):
         for name in list(able):
             say(f"{row} {turn + 1}/{repeat} {name}")
-            output = run(ROWS[row].table, name, row, ROWS[row].calls)
+            output = bench_quiet.alone(lambda name=name: run(ROWS[row].table, name, row,
+                                                             ROWS[row].calls))
             if output is None:
                 able.remove(name)
                 continue
@@ -173,9 +175,24 @@ def check_row(row, repeat, known):
     return complaints
 
 
+def prove(rows, known):
+    """Stops unless each row that is checked would be noticed if it grew by more than a third."""
+    for row in rows:
+        for metric, result in known["rows"].get(row, {"ns": None}).items():
+            if result is None:
+                sys.exit(f"bench: results.json has no {row}; measure all rows again")
+            korvex = result["korvex"]
+            for factor, complains in ((1.32, False), (1.35, True)):
+                slower = dict(korvex, **{ratio: korvex[ratio] * factor
+                                         for ratio in ("to_floor", "to_peer") if ratio in korvex})
+                if bool(grown(row, metric, {"korvex": slower}, known)) != complains:
+                    sys.exit(f"bench: {row} {metric}, {factor} times as slow, is judged wrongly")
+
+
 def check(rows, repeat):
     """Exit status: 1 when a ratio grew."""
     known = json.loads((OUT / "results.json").read_text())
+    prove(rows, known)
     complaints = [text for row in rows for text in check_row(row, repeat, known)]
     for row in (row for row in COUNTED if row in rows and shutil.which("valgrind")):
         before, now = known["instructions"].get(row, {}), instructions(row)
@@ -190,9 +207,8 @@ def write(results):
     """Everything below docs/benchmarks."""
     OUT.mkdir(parents=True, exist_ok=True)
     (OUT / "results.json").write_text(json.dumps(results, indent=1) + "\n")
-    (OUT / "README.md").write_text(bench_report.page(results))
-    for name, svg in bench_plots.plots(results).items():
-        (OUT / name).write_text(svg)
+    for name, text in {**bench_report.pages(results), **bench_plots.plots(results)}.items():
+        (OUT / name).write_text(text)
 
 
 def main():
@@ -204,7 +220,9 @@ def main():
     parser.add_argument("--count", action="store_true", help="with --rows: count instructions too")
     parser.add_argument("--dir", type=pathlib.Path, default=work, help="where the files are written")
     parser.add_argument("--redraw", action="store_true", help="only the page and the plots")
+    parser.add_argument("--busy", action="store_true", help="measure whoever else is at work")
     options = parser.parse_args()
+    bench_quiet.enforced = not options.busy
     work = options.dir.resolve()
     if options.redraw:
         return write(json.loads((OUT / "results.json").read_text()))

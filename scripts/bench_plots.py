@@ -77,7 +77,7 @@ def layouts(results):
 def threads(results):
     """Messages a second of all threads together, and the 99th percentile of a call."""
     rate, p99 = [], []
-    for n in (1, 2, 4):
+    for n in (n for n in (1, 2, 4, 8, 16) if f"threads-{n}" in results["rows"]):
         label = f"{n} thread{'s' if n > 1 else ''}"
         by = medians(results, f"threads-{n}")
         rate.append((label, {name: 1e6 / ns for name, ns in by.items()}))

@@ -25,6 +25,8 @@ ROWS = {
     "threads-1": Row("logging", 200_000, "the same, 1 thread of its own"),
     "threads-2": Row("logging", 200_000, "the same, 2 threads, one file", 0.75),
     "threads-4": Row("logging", 200_000, "the same, 4 threads, one file", 0.75),
+    "threads-8": Row("logging", 200_000, "the same, 8 threads, one file"),
+    "threads-16": Row("logging", 200_000, "the same, 16 threads, one file"),
     "start": Row("logging", 100, "main to first message, 20 categories, 5 appenders", 1.2),
 }
 SIZES = (100, 10_000, 1_000_000)

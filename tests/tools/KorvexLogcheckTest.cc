@@ -3,6 +3,7 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
+#include <csignal>
 #include <cstdlib>
 #include <map>
 #include <string>
@@ -303,6 +304,58 @@ TEST_F(KorvexLogcheckTest, SeveralFilesDoNotMixAndTheWorstOneIsTheStatus) {
     writeFile(other, "category.y=EMERG\n");
     EXPECT_EQ(run({"-q", file, other}).status, 1);
     EXPECT_EQ(run({"-q", other, file}).status, 1);
+}
+
+TEST_F(KorvexLogcheckTest, StandardInputIsReadOnce) {
+    const ChildResult result = run({"-", "-"});
+    EXPECT_EQ(result.err, "korvex-logcheck: standard input can be read once only\n");
+    EXPECT_EQ(result.status, 2);
+}
+
+// Thousands of words are told one by one, each with the beginning of the line.
+TEST_F(KorvexLogcheckTest, ALongLineIsNotQuotedWhole) {
+    std::string line = "rootCategory=";
+    for (int i = 0; i < 5000; ++i)
+        line += "no ";
+    const ChildResult result = check(line + '\n', {"-q"});
+    EXPECT_EQ(testsupport::outputLines(result.out).size(), 5000U);
+    EXPECT_LT(result.out.size(), 5000U * 1000);
+    EXPECT_THAT(result.out, HasSubstr(" no no...\": \"no\" is neither"));
+    const std::string umlauts = "x\xC3\xA4";
+    std::string long_word;
+    for (int i = 0; i < 400; ++i)
+        long_word += umlauts;
+    EXPECT_THAT(check(long_word + '\n', {"-q"}).out, Not(HasSubstr("\\x")));
+}
+
+TEST_F(KorvexLogcheckTest, AReaderThatIsGoneEndsItByTheSignal) {
+    configure("x\n");
+    for (const std::string option : {"-q", "--json", "--fix", "--paths"}) {
+        const ChildResult result = runInChild([&] {
+            int ends[2];
+            if (pipe(ends) != 0) return 1;
+            close(ends[0]);
+            dup2(ends[1], STDOUT_FILENO);
+            signal(SIGPIPE, SIG_DFL);
+            execLogcheck({option, file});
+            return 127;
+        });
+        EXPECT_EQ(result.signal, SIGPIPE) << option;
+        EXPECT_EQ(result.err, "") << option;
+    }
+}
+
+TEST_F(KorvexLogcheckTest, WhatIsNamedInAComplaintReachesNoTerminal) {
+    EXPECT_EQ(run({"--no\033[31m", file}).err, "korvex-logcheck: --no\\x1b[31m: unknown option\n");
+    EXPECT_EQ(run({"a\nb\x9b"}).err,
+              "korvex-logcheck: cannot read a\\x0ab\\x9b: No such file or directory\n");
+    EXPECT_EQ(run({""}).err, "korvex-logcheck: cannot read \"\": No such file or directory\n");
+    const std::string odd = dir.file("e\033\n\xff.cfg");
+    writeFile(odd, "x\n");
+    for (const std::string option : {"-q", "--json", "--paths"}) {
+        const ChildResult result = run({option, odd, odd});
+        EXPECT_THAT(result.out, AllOf(HasSubstr("e\\"), Not(HasSubstr("\033"))));
+    }
 }
 
 TEST_F(KorvexLogcheckTest, AFileWithoutAnEndIsNoConfiguration) {

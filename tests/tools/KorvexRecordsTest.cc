@@ -339,6 +339,11 @@ TEST_F(KorvexRecordsTest, TheDirectoryIsMadeOnRequestOnly) {
                                   "/hashDb: no such directory; put, load and batch make it with "
                                   "--create\n");
     }
+    EXPECT_EQ(statusOf({"--create", "put", "_record-file-version", "1"}), 2);
+    EXPECT_EQ(statusOf({"--create", "load"}, "VERSION=3\n"), 2);
+    EXPECT_EQ(statusOf({"--create", "batch"}, "remove\ta\n"), 1);
+    EXPECT_EQ(statusOf({"--create", "load", "--dry-run"}, "VERSION=3\nHEADER=END\nDATA=END\n"), 0);
+    EXPECT_FALSE(std::filesystem::exists(_db + "/hashDb")) << "nothing was put there";
     EXPECT_EQ(statusOf({"--create", "put", "a", "1"}), 0);
     EXPECT_EQ(readFile(_data), kVersion + kA1);
     struct stat st {};
@@ -388,11 +393,12 @@ TEST_F(KorvexRecordsTest, ASaveThatFailsLeavesTheOldFileAndTellsTheReason) {
     EXPECT_THAT(namesBesideData(), ElementsAre("data"));
 }
 
-TEST_F(KorvexRecordsTest, RunsWaitForEachOther) {
+TEST_F(KorvexRecordsTest, RunsWaitForEachOtherAndOfFirstOnesNoneIsLost) {
+    std::filesystem::remove_all(_db + "/hashDb");
     std::vector<pid_t> children;
     for (int i = 0; i < 8; ++i) {
         const pid_t pid = fork();
-        if (pid == 0) _exit(statusOf({"put", "key" + std::to_string(i), "v"}));
+        if (pid == 0) _exit(statusOf({"--create", "put", "key" + std::to_string(i), "v"}));
         children.push_back(pid);
     }
     for (const pid_t pid : children) {

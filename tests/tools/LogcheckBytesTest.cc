@@ -28,6 +28,10 @@ TEST_F(LogcheckBytesTest, CarriageReturnsAreToldOnceForTheFile) {
                 ElementsAre("2:20: error: 3 lines of the file, from this one on, end as on "
                             "Windows: the carriage return becomes part of the last word, number "
                             "or file name [bytes.crlf]"));
+    EXPECT_THAT(findings("rootCategory=INFO\r\n"),
+                ElementsAre("1:18: error: 1 line of the file, from this one on, ends as on "
+                            "Windows: the carriage return becomes part of the last word, number "
+                            "or file name [bytes.crlf]"));
     // The others are told as if the lines ended well.
     EXPECT_THAT(codes(withCarriageReturns(good + "category.x=debug\n")),
                 ElementsAre("bytes.crlf", "level.case"));
@@ -83,9 +87,11 @@ TEST_F(LogcheckBytesTest, ACommentWithoutAnEnd) {
 // cut, overlong, surrogates, beyond Unicode.
 TEST_F(LogcheckBytesTest, NothingThatATerminalObeysReachesIt) {
     const std::vector<std::string> bad = {
-        "\x1b]0;",  "\x9b"s, "\xC2\x9b",        "\xE2\x80\xAE", "\xE2\x81\xA6", "\xEF\xBB\xBF",
-        "\xC2\xA0", "\x7f",  "\xC0\xAF",        "\xE0\x80\xAF", "\xED\xA0\x80", "\xF4\x90\x80\x80",
-        "\xE2\x82", "\xFF",  "\xF0\x8F\xBF\xBF"};
+        "\x1b]0;",      "\x9b"s,        "\xC2\x9b",         "\xE2\x80\xAE",
+        "\xE2\x81\xA6", "\xEF\xBB\xBF", "\xC2\xA0",         "\x7f",
+        "\xC0\xAF",     "\xE0\x80\xAF", "\xED\xA0\x80",     "\xF4\x90\x80\x80",
+        "\xE2\x82",     "\xFF",         "\xF0\x8F\xBF\xBF", "\xD8\x9C",
+        "\xE2\x80\x89", "\xE3\x80\x80", "\xEF\xB8\x8F",     "\xF3\xA0\x81\x81"};
     for (const std::string& bytes : bad) {
         const std::string text = "category.a" + bytes + "=INFO," + bytes + "\nappender.a" + bytes +
                                  ".fileName=/a" + bytes + "\nx" + bytes + "\n" + pattern + bytes +

@@ -1,6 +1,7 @@
 #include <gmock/gmock.h>
 #include <unistd.h>
 
+#include <algorithm>
 #include <filesystem>
 #include <string>
 #include <vector>
@@ -37,6 +38,13 @@ TEST_F(LogcheckFilesTest, ARelativeNameDependsOnWhereTheProgramStarts) {
                 ElementsAre("2:21: warning: fileName \"log/a.log\" is relative: the file is where "
                             "the program happens to be started; did you mean "
                             "\"${KORVEX_HOME}/log/a.log\"? [file.relative]"));
+    const auto meant = [&](const std::string& name) {
+        const std::string line = told(name).at(0);
+        return line.substr(std::min(line.find("; did"), line.rfind(" [")));
+    };
+    EXPECT_EQ(meant("././a.log"), "; did you mean \"${KORVEX_HOME}/a.log\"? [file.relative]");
+    for (const std::string name : {"../a.log", "C:\\a.log", "file:///a.log"})
+        EXPECT_EQ(meant(name), " [file.relative]");
 }
 
 TEST_F(LogcheckFilesTest, WhatIsNotReplaced) {
@@ -58,7 +66,16 @@ TEST_F(LogcheckFilesTest, OtherFormsOfTheHome) {
          {"$KORVEX_HOME", "%KORVEX_HOME%", "$(KORVEX_HOME)", "${korvex_home}"}) {
         EXPECT_EQ(mended(form + "/b.log"), "${KORVEX_HOME}/b.log");
     }
+    for (const std::string form : {"${KORVEX_HOME", "{KORVEX_HOME}", "<KORVEX_HOME>",
+                                   "@KORVEX_HOME@", "KORVEX_HOME", "${env:KORVEX_HOME}"}) {
+        EXPECT_EQ(mended(form + "/b.log"), "${KORVEX_HOME}/b.log") << form;
+    }
     EXPECT_EQ(mended("$KORVEX_HOMES/b.log"), "$KORVEX_HOMES/b.log");
+    EXPECT_EQ(mended("${KORVEX_HOME:-/opt}/b.log"), "${KORVEX_HOME:-/opt}/b.log");
+    EXPECT_EQ(mended("korvex_home/b.log"), "korvex_home/b.log");
+    EXPECT_THAT(told("${KORVEXHOME}/b.log"),
+                ElementsAre(testing::EndsWith("\"${KORVEXHOME}/b.log\"; did you mean "
+                                              "\"${KORVEX_HOME}/b.log\"? [file.variable]")));
     EXPECT_THAT(told("${KORVEX_HOME}log/c.log"),
                 ElementsAre("2:35: warning: no \"/\" between ${KORVEX_HOME} and \"log/c.log\"; did "
                             "you mean \"${KORVEX_HOME}/log/c.log\"? [file.home]"));
@@ -72,29 +89,42 @@ TEST_F(LogcheckFilesTest, QuotationMarksBelongToTheName) {
                 ElementsAre("2:21: warning: the quotation marks belong to the name: \"/a.log\"; "
                             "did you mean \"/a.log\"? [file.quoted]"));
     EXPECT_EQ(mended("'\"/a.log\"'"), "/a.log");
+    EXPECT_THAT(told("/a.log\""),
+                ElementsAre("2:21: warning: the quotation mark belongs to the name: /a.log\"; did "
+                            "you mean \"/a.log\"? [file.quoted]"));
+    EXPECT_EQ(mended("\"/a.log"), "/a.log");
+    EXPECT_EQ(mended("\"\""), "");
 }
 
 TEST_F(LogcheckFilesTest, ADirectoryIsNoFile) {
-    EXPECT_THAT(told("${KORVEX_HOME}"), ElementsAre("2:21: warning: this is the home itself, a "
-                                                    "directory [file.directory]"));
-    EXPECT_THAT(told("${KORVEX_HOME}/"), ElementsAre("2:21: warning: this is the home itself, a "
-                                                     "directory [file.directory]"));
-    EXPECT_THAT(told("/no/such/"), ElementsAre("2:21: warning: \"/no/such/\" names a directory "
-                                               "[file.directory]"));
-    EXPECT_THAT(told("/no/such/.."), ElementsAre("2:21: warning: \"/no/such/..\" names a "
-                                                 "directory [file.directory]"));
-    EXPECT_THAT(told(dir.path()), ElementsAre("2:21: warning: \"" + dir.path() +
-                                              "\" names a directory [file.directory]"));
+    EXPECT_THAT(told("${KORVEX_HOME}"),
+                ElementsAre("2:21: warning: this is the home itself, a "
+                            "directory: no line is written [file.directory]"));
+    EXPECT_THAT(told("${KORVEX_HOME}/"),
+                ElementsAre("2:21: warning: this is the home itself, a "
+                            "directory: no line is written [file.directory]"));
+    EXPECT_THAT(told("/no/such/"), ElementsAre("2:21: warning: \"/no/such/\" names a directory: no "
+                                               "line is written [file.directory]"));
+    EXPECT_THAT(told("/no/such/.."),
+                ElementsAre("2:21: warning: \"/no/such/..\" names a directory: "
+                            "no line is written [file.directory]"));
+    EXPECT_THAT(told(dir.path()),
+                ElementsAre("2:21: warning: \"" + dir.path() +
+                            "\" names a directory: no line is written [file.directory]"));
     EXPECT_THAT(told("/no/such/..."), IsEmpty());
 }
 
 TEST_F(LogcheckFilesTest, OneFileOfTwoAppenders) {
     EXPECT_THAT(toldOfTwo("/d.log", "/d.log"),
-                ElementsAre("3:21: warning: Appender \"B\" writes to the same file as \"A\"; each "
-                            "rotates it by itself [file.same]"));
+                ElementsAre("3:21: warning: Appender \"B\" writes to the same file as \"A\"; "
+                            "their lines are mixed there [file.same]"));
+    EXPECT_THAT(
+        toldOfTwo("/d.log", "/d.log", "appender.B.maxFileSize=4096\nappender.B.maxBackupIndex=1\n"),
+        ElementsAre("3:21: warning: Appender \"B\" writes to the same file as \"A\"; each "
+                    "rotates it by itself [file.same]"));
     EXPECT_THAT(toldOfTwo("/no/such/d.log", "/no/./x/..//such/d.log"),
                 ElementsAre("3:21: warning: Appender \"B\" writes to the same file as \"A\", "
-                            "which calls it \"/no/such/d.log\"; each rotates it by itself "
+                            "which calls it \"/no/such/d.log\"; their lines are mixed there "
                             "[file.same]"));
     EXPECT_THAT(toldOfTwo("/no/such/d.log", "/no/such/D.log"), IsEmpty());
     EXPECT_THAT(toldOfTwo("/dev/null", "/dev/null"), IsEmpty());
@@ -108,6 +138,29 @@ TEST_F(LogcheckFilesTest, OneFileByLinks) {
     ASSERT_EQ(link(dir.file("a.log").c_str(), dir.file("b.log").c_str()), 0);
     EXPECT_THAT(toldOfTwo(dir.file("a.log"), dir.file("b.log")),
                 ElementsAre(testing::EndsWith("[file.same]")));
+}
+
+TEST_F(LogcheckFilesTest, LinksToWhatIsNotThereYet) {
+    ASSERT_EQ(symlink("none.log", dir.file("a.log").c_str()), 0);
+    ASSERT_EQ(symlink((dir.path() + "/./none.log").c_str(), dir.file("b.log").c_str()), 0);
+    EXPECT_THAT(toldOfTwo(dir.file("a.log"), dir.file("b.log")),
+                ElementsAre(testing::EndsWith("[file.same]")));
+    ASSERT_EQ(symlink("loop", dir.file("loop").c_str()), 0);
+    EXPECT_THAT(toldOfTwo(dir.file("loop"), dir.file("a.log")), IsEmpty());
+}
+
+// A rotation renames the link, and leaves what it leads to alone.
+TEST_F(LogcheckFilesTest, ABackupOfALink) {
+    const std::string limits = "appender.A.maxFileSize=4096\nappender.A.maxBackupIndex=3\n";
+    std::filesystem::create_directory(dir.file("data"));
+    writeFile(dir.file("data/real.log"), "");
+    ASSERT_EQ(symlink("data/real.log", dir.file("a.log").c_str()), 0);
+    ASSERT_EQ(symlink("a.log.2", dir.file("alias.log").c_str()), 0);
+    for (const std::string name : {"a.log.1", "alias.log"}) {
+        EXPECT_THAT(toldOfTwo(dir.file("a.log"), dir.file(name), limits),
+                    ElementsAre(testing::EndsWith("[file.backup]")));
+    }
+    EXPECT_THAT(toldOfTwo(dir.file("a.log"), dir.file("data/real.log.1"), limits), IsEmpty());
 }
 
 TEST_F(LogcheckFilesTest, AFileThatIsAnothersBackup) {
@@ -194,6 +247,8 @@ TEST_F(LogcheckFilesTest, ANumberWithAUnitSaysTheNumber) {
     EXPECT_EQ(number("1'000"), "1000");
     EXPECT_EQ(number("+4096"), "4096");
     EXPECT_EQ(number("004096"), "4096");
+    EXPECT_EQ(number("\"4096\""), "4096");
+    EXPECT_EQ(number("'10 megabytes'"), "10485760");
     for (const std::string text : {"-1", "ten", "1.5MB", "1,00", "1,0000", "1,000'000", "10 MBit",
                                    "0x400", "9223372036854775808k", "99999999TB"}) {
         EXPECT_EQ(number(text), text);
@@ -237,8 +292,6 @@ TEST_F(LogcheckFilesTest, AValueThatKeepsWhatIsBehindIt) {
                             "you mean \"/a.log\"? [value.tail]",
                             "3:27: warning: fileName keeps the \"#\" that follows it directly: "
                             "\"/b.log#\"; did you mean \"/b.log\"? [value.tail]",
-                            "4:12: warning: the layout of \"B\" does not end in %n: its lines run "
-                            "into each other [pattern.no-newline]",
                             "4:41: warning: layout.ConversionPattern keeps the blank behind it: "
                             "\"%m%n\\x09\"; did you mean \"%m%n\"? [value.tail]"));
     EXPECT_EQ(fixed("rootCategory=A\nappender.A.fileName=/a.log # here\n"),

@@ -117,6 +117,33 @@ TEST_F(LogcheckPathsTest, AFileThatCanBeWrittenButNotRenamed) {
     EXPECT_THAT(told(log + "/a.log"), IsEmpty());
 }
 
+// As in /tmp, where only the owner of a file renames it.
+TEST_F(LogcheckPathsTest, AFileOfSomebodyElseWhereOnlyOwnersRename) {
+    if (!isRoot) GTEST_SKIP() << "only root gives files away";
+    writeFile(log + "/a.log", "");
+    ASSERT_EQ(chmod((log + "/a.log").c_str(), 0666), 0);
+    ASSERT_EQ(chmod(log.c_str(), 01777), 0);
+    EXPECT_THAT(
+        told(log + "/a.log", rotated),
+        ElementsAre("2:21: warning: \"" + log +
+                    "/a.log\" cannot be renamed: only its owner can, in this directory; the "
+                    "file grows beyond maxFileSize [path.no-rotation]"));
+    EXPECT_THAT(told(log + "/a.log"), IsEmpty());
+    EXPECT_THAT(told(log + "/b.log", rotated), IsEmpty());
+    const struct passwd* const nobody = getpwnam("nobody");
+    ASSERT_EQ(chown((log + "/a.log").c_str(), nobody->pw_uid, 0), 0);
+    EXPECT_THAT(told(log + "/a.log", rotated), IsEmpty());
+}
+
+TEST_F(LogcheckPathsTest, ALinkThatCannotBeRenamed) {
+    ASSERT_EQ(mkdir((log + "/links").c_str(), 0755), 0);
+    ASSERT_EQ(symlink("../b.log", (log + "/links/a.log").c_str()), 0);
+    ASSERT_EQ(chmod((log + "/links").c_str(), 0555), 0);
+    EXPECT_THAT(told(log + "/links/a.log", rotated),
+                ElementsAre(testing::EndsWith("[path.no-rotation]")));
+    EXPECT_THAT(told(log + "/links/a.log"), IsEmpty());
+}
+
 TEST_F(LogcheckPathsTest, ALinkToWhatIsNotThereYet) {
     ASSERT_EQ(symlink("../none/b.log", (log + "/a.log").c_str()), 0);
     EXPECT_THAT(told(log + "/a.log"), ElementsAre(HasSubstr("[path.missing]")));

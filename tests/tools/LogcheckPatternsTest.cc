@@ -53,7 +53,9 @@ TEST_F(LogcheckPatternsTest, ConversionsThatThereAreNot) {
         told("%x%F%L%M%l%C{1}%X{u} %m%n"),
         ElementsAre("1: " + nothing("%x") + "; there is no diagnostic context" + code,
                     "3: " + nothing("%F") + place + code, "5: " + nothing("%L") + place + code,
-                    "7: " + nothing("%M") + place + code, "9: " + nothing("%l") + place + code,
+                    "7: " + nothing("%M") + place + code,
+                    "9: " + nothing("%l") + place +
+                        ", and milliseconds are %l within the braces of %d only" + code,
                     "11: " + nothing("%C{1}") + "; did you mean \"%c\"?" + code,
                     "16: " + nothing("%X{u}") + "; there is no diagnostic context" + code));
     EXPECT_THAT(told("%3%m%m%n"), ElementsAre("1: " + nothing("%3%") + code));
@@ -65,23 +67,52 @@ TEST_F(LogcheckPatternsTest, ConversionsThatThereAreNot) {
 TEST_F(LogcheckPatternsTest, TheLettersAreThoseOfTheLibrary) {
     const Logger logger("channel");
     const LogMsgMetadata md(&logger, WARN);
-    std::string all;
-    std::vector<std::string> expected;
+    std::size_t count = 0;
     for (char letter = 'A'; letter <= 'z'; ++letter) {
         if (letter > 'Z' && letter < 'a') continue;
         const std::string conversion = std::string("%") + letter;
         std::string line;
         LogFormat(conversion.c_str()).apply(line, md, "message");
-        if (line.empty()) expected.push_back(nothing(conversion));
-        all += conversion + ' ';
+        const std::vector<std::string> all = told(conversion + " %m%n");
+        if (line.empty()) {
+            ++count;
+            EXPECT_THAT(all, ElementsAre(testing::StartsWith("1: " + nothing(conversion))));
+        } else {
+            EXPECT_THAT(all, IsEmpty()) << conversion;
+        }
     }
-    EXPECT_EQ(expected.size(), 52U - 9U);
-    std::vector<std::string> got;
-    for (const std::string& line : told(all + "%n")) {
-        const std::string text = line.substr(line.find(' ') + 1);
-        got.push_back(text.substr(0, text.find("nothing") + 7));
-    }
-    EXPECT_EQ(got, expected);
+    EXPECT_EQ(count, 52U - 9U);
+}
+
+TEST_F(LogcheckPatternsTest, ADateOutsideOfItsBracesIsToldOnce) {
+    const std::string date =
+        ": warning: there is no conversion \"%Y\": it prints nothing; what is a date's stands in "
+        "%d{...} [pattern.unknown]";
+    EXPECT_THAT(told("%Y-%m-%d %H:%M:%S %p: %m%n"), ElementsAre("1" + date));
+    EXPECT_THAT(told("d{%Y-%m-%d %H:%M} %m%n"), ElementsAre("3" + date));
+    EXPECT_THAT(told("%%d{%Y-%m-%d %H:%M} %m%n"), ElementsAre("5" + date));
+    EXPECT_THAT(told("%H %m%n"), ElementsAre("1: " + nothing("%H") + " [pattern.unknown]"));
+}
+
+TEST_F(LogcheckPatternsTest, ABlankInAConversion) {
+    EXPECT_THAT(told("% m%n"), ElementsAre("1: " + nothing("% ") +
+                                           ", and the letter behind it is text; did you mean "
+                                           "\"%m\"? [pattern.unknown]"));
+    EXPECT_EQ(mended("%- p 50% of %m%n"), "%-p 50% of %m%n");
+}
+
+TEST_F(LogcheckPatternsTest, AHashCutsThePattern) {
+    const std::string hash =
+        ": warning: a comment begins at the \"#\", wherever it stands: the pattern ends before it "
+        "[pattern.hash]";
+    EXPECT_THAT(told("%p # %m%n"), ElementsAre("4" + hash));
+    EXPECT_THAT(told("[#%t] %p %m%n"), ElementsAre("2" + hash));
+    EXPECT_THAT(told("%m #%t%n"), ElementsAre("4" + hash));
+    // A comment behind a pattern that is whole, and one that holds none.
+    EXPECT_THAT(told("%m%n   # %m is the message"), ElementsAre(testing::EndsWith("[value.tail]")));
+    EXPECT_THAT(told("%m%%n # 100% of it"), ElementsAre(testing::EndsWith("[pattern.no-newline]"),
+                                                        testing::EndsWith("[value.tail]")));
+    EXPECT_THAT(told("%p <!-- %m%n"), ElementsAre(testing::EndsWith("[comment.open]")));
 }
 
 TEST_F(LogcheckPatternsTest, ConversionsSpeltOut) {
@@ -93,6 +124,8 @@ TEST_F(LogcheckPatternsTest, ConversionsSpeltOut) {
                             "19: warning: %class is %c and the text \"lass\" [pattern.word]"));
     EXPECT_EQ(mended("%date{HH:mm:ss} [%thread] %-5level %logger{36} - %msg%newline"),
               "%d{%H:%M:%S} [%t] %-5p %c - %m%n");
+    EXPECT_EQ(mended("%timestamp %threadName %tid %Level %MSG%n"), "%d %t %t %p %m%n");
+    EXPECT_THAT(told("%mdc{u} %marker %uuid %ex %clr(%p) %m%n").size(), 5U);
     EXPECT_THAT(told("%cat %mat %nline %m%n"), IsEmpty());
 }
 
@@ -106,6 +139,9 @@ TEST_F(LogcheckPatternsTest, AConversionThatThePatternsEndCuts) {
                 ElementsAre("5: " + cut +
                             "%d{ISO8601\", which prints nothing: there is no \"}\"; did you mean "
                             "\"%d{ISO8601}\"? [pattern.cut]"));
+    // The rest of the pattern is in it.
+    EXPECT_THAT(told("%p %d{%H:%M %m%n"), ElementsAre(testing::EndsWith("[pattern.cut]")));
+    EXPECT_THAT(told("%p %m%"), ElementsAre(testing::EndsWith("[pattern.cut]")));
 }
 
 TEST_F(LogcheckPatternsTest, AnArgumentWhereNoneCounts) {
@@ -114,6 +150,13 @@ TEST_F(LogcheckPatternsTest, AnArgumentWhereNoneCounts) {
                             "argument; a width, as in %.20c, cuts the text; did you mean "
                             "\"%-5c\"? [pattern.argument]"));
     EXPECT_EQ(mended("%-5c{2} %m{}%n{x}"), "%-5c %m%n");
+    EXPECT_THAT(
+        told("%d{ISO8601}{UTC} %m%n"),
+        ElementsAre("12: warning: \"{UTC}\" is printed as it stands: a conversion takes one "
+                    "argument, and dates are those of the local time; did you mean "
+                    "\"%d{ISO8601}\"? [pattern.argument]"));
+    EXPECT_EQ(mended("%d{ISO8601}{UTC} %m%n"), "%d{ISO8601} %m%n");
+    EXPECT_THAT(told("{%d}{%t}{%c} %d{DATE}{%p} %d {x} %m%n"), IsEmpty());
 }
 
 TEST_F(LogcheckPatternsTest, APatternWithoutItsMessage) {
@@ -122,8 +165,11 @@ TEST_F(LogcheckPatternsTest, APatternWithoutItsMessage) {
     EXPECT_THAT(told("%p %.0m %%m%n"), ElementsAre("1: warning: without %m no line shows its "
                                                    "message [pattern.no-message]"));
     EXPECT_THAT(told("%p %M%n"),
-                testing::Contains("1: warning: without %m no line shows its message; did you mean "
-                                  "\"%m\"? [pattern.no-message]"));
+                ElementsAre("4: warning: there is no conversion \"%M\": it prints nothing; did you "
+                            "mean \"%m\"? [pattern.unknown]"));
+    EXPECT_EQ(mended("%p %M%n"), "%p %m%n");
+    EXPECT_THAT(told(""), ElementsAre("1: warning: the pattern is empty: nothing is written "
+                                      "[pattern.no-message]"));
 }
 
 TEST_F(LogcheckPatternsTest, QuotationMarksAreNotToldAsAMissingNewlineToo) {
@@ -132,6 +178,12 @@ TEST_F(LogcheckPatternsTest, QuotationMarksAreNotToldAsAMissingNewlineToo) {
                             "mean \"%m%n\"? [pattern.quoted]"));
     EXPECT_EQ(mended("\"'%p %m%n'\""), "%p %m%n");
     EXPECT_THAT(told("\"%p\" %m%n"), IsEmpty());
+    EXPECT_THAT(told("\"%m%n"),
+                ElementsAre("1: warning: the quotation mark is printed with each line; did you "
+                            "mean \"%m%n\"? [pattern.quoted]"));
+    EXPECT_EQ(mended("%m%n'"), "%m%n");
+    EXPECT_EQ(mended("\xE2\x80\x9C%m%n\xE2\x80\x9D"), "%m%n");
+    EXPECT_THAT(told("it's %m%n"), IsEmpty());
 }
 
 TEST_F(LogcheckPatternsTest, BackslashesOfAProgrammingLanguage) {
@@ -154,7 +206,13 @@ TEST_F(LogcheckPatternsTest, ALayoutThatAsksForTooMuch) {
     EXPECT_THAT(findings(pattern + "%-4000000000m%n\n"),
                 ElementsAre("3:12: warning: the layout of \"A\" asks for a width of six digits "
                             "[pattern.width]"));
-    EXPECT_THAT(findings(pattern + "%99999m 123456%n\n"), IsEmpty());
+    EXPECT_THAT(codes(pattern + "%d{%0300000Y} %m%n\n"), ElementsAre("pattern.width"));
+    EXPECT_THAT(findings(pattern + "%99999m 123456 100%%123456 %.9999999m%n\n"), IsEmpty());
+}
+
+// What is cut pads nothing.
+TEST_F(LogcheckPatternsTest, AWideConversionThatIsCut) {
+    EXPECT_THAT(told("%m%n%999999"), ElementsAre(testing::EndsWith("[pattern.cut]")));
 }
 
 TEST_F(LogcheckPatternsTest, DatesInTheJavaForm) {
@@ -173,6 +231,22 @@ TEST_F(LogcheckPatternsTest, DatesInTheJavaForm) {
     EXPECT_EQ(mended("%d{HH:mm:ss.SSSSSS} %m%n"), "%d{HH:mm:ss.SSSSSS} %m%n");
 }
 
+TEST_F(LogcheckPatternsTest, TheJavaFormAmongConversions) {
+    EXPECT_THAT(told("%d{%H:%M:%S,SSS} %m%n"),
+                ElementsAre("13: warning: \"SSS\" is printed as it stands: dates are written as "
+                            "strftime has them; did you mean \"%l\"? [date.java]"));
+    EXPECT_EQ(mended("%d{%Y-%m-%d'T'%H:mm:ss} %m%n"), "%d{%Y-%m-%dT%H:%M:%S} %m%n");
+    EXPECT_THAT(told("%d{%YYYY-%m-%dd %SSS} %m%n"),
+                ElementsAre("4: warning: \"%YYYY\" is %Y and the text \"YYY\"; did you mean "
+                            "\"%Y\"? [date.java]",
+                            "13: warning: \"%dd\" is %d and the text \"d\"; did you mean \"%d\"? "
+                            "[date.java]",
+                            "17: warning: \"%SSS\" is %S and the text \"SS\" [date.java]"));
+    EXPECT_EQ(mended("%d{%YYYY-%MM-%dd %HH:%m} %m%n"), "%d{%Y-%MM-%d %H:%M} %m%n");
+    EXPECT_THAT(told("%d{%Hh%Mm%Ss %ss '%y %A, the %d of %B, o'clock, %j days at %H} %m%n"),
+                IsEmpty());
+}
+
 TEST_F(LogcheckPatternsTest, NamedLayoutsMisspelt) {
     EXPECT_THAT(told("%d{iso8601} %m%n"),
                 ElementsAre("4: warning: \"iso8601\" is no named layout, and is printed as it "
@@ -186,6 +260,16 @@ TEST_F(LogcheckPatternsTest, ADateWithoutAConversion) {
     EXPECT_THAT(told("%d{today} %m%n"), ElementsAre("4: warning: \"today\" has no conversion: each "
                                                     "line shows it as it stands [date.text]"));
     EXPECT_EQ(mended("%d{today} %m%n"), "%d{today} %m%n");
+}
+
+TEST_F(LogcheckPatternsTest, ALetterOfADateWithoutItsPercentSign) {
+    const std::string text =
+        "\" is no conversion: each line shows it as it stands; did you mean \"%";
+    EXPECT_THAT(told("%d{%Y-m-%d %H:M:%S,l %d} %m%n"),
+                ElementsAre("7: warning: \"m" + text + "m\"? [date.text]",
+                            "15: warning: \"M" + text + "M\"? [date.text]",
+                            "20: warning: \"l" + text + "l\"? [date.text]"));
+    EXPECT_THAT(told("%d{Y-%m-%d} %d{%H:%M:S} %m%n").size(), 2U);
 }
 
 TEST_F(LogcheckPatternsTest, ConversionsThatStrftimeDoesNotKnow) {
@@ -212,6 +296,8 @@ TEST_F(LogcheckPatternsTest, MonthsWhereMinutesAreMeant) {
                             "\"%H:%M\"? [date.minutes]"));
     EXPECT_EQ(mended("%d{%Y-%M-%d %H:%m} %d{%d.%M.%Y} %d{%I:%m} %m%n"),
               "%d{%Y-%m-%d %H:%M} %d{%d.%m.%Y} %d{%I:%M} %m%n");
+    EXPECT_EQ(mended("%d{%Y%M%d-%H%m%S} %d{%d-%M-%y %H.%m} %d{%M/%d/%y} %m%n"),
+              "%d{%Y%m%d-%H%M%S} %d{%d-%m-%y %H.%M} %d{%m/%d/%y} %m%n");
 }
 
 TEST_F(LogcheckPatternsTest, MillisecondsThatAreNone) {

@@ -89,6 +89,16 @@ TEST_F(ArgumentsTest, WaitingTakesANumberOfSeconds) {
     }
 }
 
+TEST_F(ArgumentsTest, AMessageMovesNoCursorWhateverTheNamesInIt) {
+    const std::string red = "\x1b[31m\n\xC2\x9B\xC3\xBC";
+    EXPECT_EQ(run({"-f", dir.file(red), "list"}).err,
+              "korvex-records: " + dir.file("\\1b[31m\\0a\\c2\\9b\xC3\xBC: no such file\n"));
+    EXPECT_EQ(run({"--" + red, "list"}).err,
+              "korvex-records: --\\1b[31m\\0a\\c2\\9b\xC3\xBC: unknown option\n");
+    EXPECT_EQ(run({"help", "\x1b[31m"}).err,
+              "korvex-records: \\1b[31m: unknown verb; see --help\n");
+}
+
 TEST_F(ArgumentsTest, OneOfAThingIsSaidSo) {
     EXPECT_EQ(run({"check"}).out, data + ": whole, version \"2.0\", 1 record, 41 bytes\n");
     EXPECT_THAT(run({"stats"}).out, HasSubstr("1 record\n"));

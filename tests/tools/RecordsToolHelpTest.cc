@@ -90,13 +90,15 @@ TEST_F(HelpTest, AnOptionThatAVerbDoesNotTakeIsAnError) {
     for (const std::string& verb : verbs()) {
         const std::string own = bare({"help", verb}).out;
         for (const std::string& option : options()) {
-            const ChildResult result = bare({verb, option + "=1"});
-            const bool isTaken = own.find(option + "=") != own.npos;
             const bool isFlag = help.find(option + "=") == help.npos;
-            if (isTaken || isFlag) continue;
-            EXPECT_EQ(result.status, 2) << verb << option;
-            EXPECT_EQ(result.err, "korvex-records: " + verb + " takes no " + option + "; see " +
-                                      verb + " --help\n");
+            const ChildResult result = bare({verb, isFlag ? option : option + "=1"});
+            const std::string refusal =
+                "korvex-records: " + verb + " takes no " + option + "; see " + verb + " --help\n";
+            const bool isTaken = own.find(option + (isFlag ? " " : "=")) != own.npos;
+            EXPECT_EQ(result.err == refusal, !isTaken) << verb << option << result.err;
+            if (!isTaken) {
+                EXPECT_EQ(result.status, 2) << verb << option;
+            }
         }
     }
     for (const std::vector<std::string>& arguments : std::vector<std::vector<std::string>>{
@@ -116,6 +118,9 @@ TEST_F(HelpTest, WhatWasMeantIsTold) {
                                          ": unknown verb; did you mean " + verb + "?\n");
     }
     EXPECT_EQ(bare({"xyzzy"}).err, "korvex-records: xyzzy: unknown verb; see --help\n");
+    EXPECT_EQ(bare({"help", "delete"}).err,
+              "korvex-records: delete: unknown verb; did you mean remove?\n");
+    EXPECT_EQ(bare({"help", "xyzzy"}).err, "korvex-records: xyzzy: unknown verb; see --help\n");
     EXPECT_EQ(bare({"--hepl"}).err,
               "korvex-records: --hepl: unknown option; did you mean --help?\n");
     EXPECT_EQ(bare({"--nonsense"}).err, "korvex-records: --nonsense: unknown option\n");

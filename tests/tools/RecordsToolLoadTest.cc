@@ -90,6 +90,28 @@ TEST_F(LoadTest, AKeyThatComesTwiceIsRefused) {
               "1 record added, 0 changed, 0 removed\n");
 }
 
+// Its beginning is read again where the order breaks.
+TEST_F(LoadTest, ADumpNeedNotBeInOrder) {
+    const std::string some = head + " m\n M\n q\n Q\n c\n C\n x\n X\n d\n D\n";
+    const std::string lines =
+        "{\"key\":\"m\",\"value\":\"M\"}\n{\"key\":\"q\",\"value\":\"Q\"}\n"
+        "{\"key\":\"c\",\"value\":\"C\"}\n{\"key\":\"x\",\"value\":\"X\"}\n"
+        "{\"key\":\"d\",\"value\":\"D\"}\n";
+    const std::string all = fileOf({{"c", "C"}, {"d", "D"}, {"m", "M"}, {"q", "Q"}, {"x", "X"}});
+    const std::string told = "4 records added, 1 changed, 2 removed\n";
+    EXPECT_EQ(loaded({"load", "--replace"}, some + "DATA=END\n"), told);
+    EXPECT_EQ(stored(), all);
+    EXPECT_EQ(loaded({"load", "--replace", "--json"}, lines), told);
+    EXPECT_EQ(stored(), all);
+    writeFile(data, before);
+    for (const std::string key : {"m", "q", "c", "x", "d"}) {
+        expectRefused(some + " " + key + "\n 1\nDATA=END\n",
+                      "line 15: key \"" + key + "\" comes twice");
+        expectRefused(lines + "{\"key\":\"" + key + "\",\"value\":\"1\"}\n",
+                      "line 6: key \"" + key + "\" comes twice", {"load", "--json"});
+    }
+}
+
 TEST_F(LoadTest, RecordsWithoutKeysAndUnknownFormatsAreRefused) {
     expectRefused("VERSION=3\ntype=recno\nHEADER=END\n 61\nDATA=END\n",
                   "line 3: a dump without keys");
@@ -123,19 +145,20 @@ TEST_F(LoadTest, JsonReadsBackExactly) {
     std::string all;
     for (int c = 0; c < 256; ++c)
         all += static_cast<char>(c);
-    const std::string any = fileOf({{"", "\xff"},
-                                    {"\x01\"\\/\b\t\n", all},
-                                    {"gr\xC3\xBC\xC3\x9F \xF0\x9F\x98\x80", "\x7f"},
-                                    {"nul", "a\0b"s},
-                                    {"\xff", ""}});
+    const std::string any =
+        fileOf({{"", "\xff"},
+                {"\x01\"\\/\b\t\n", all},
+                {"gr\xC3\xBC\xC3\x9F \xF0\x9F\x98\x80", "\x7f\xC2\x80\xC2\x9F\xC2\xA0"},
+                {"nul", "a\0b"s},
+                {"\xff", ""}});
     writeFile(data, any);
     const std::string json = run({"dump", "--json"}).out;
     EXPECT_EQ(json.substr(0, json.find('\n')), "{\"key\":\"\",\"value_base64\":\"/w==\"}");
     EXPECT_THAT(json,
                 HasSubstr("\n{\"key\":\"\\u0001\\\"\\\\/\\u0008\\t\\n\",\"value_base64\":\"AAEC"));
-    EXPECT_THAT(
-        json,
-        HasSubstr("\n{\"key\":\"gr\xC3\xBC\xC3\x9F \xF0\x9F\x98\x80\",\"value\":\"\\u007f\"}\n"));
+    EXPECT_THAT(json,
+                HasSubstr("\n{\"key\":\"gr\xC3\xBC\xC3\x9F "
+                          "\xF0\x9F\x98\x80\",\"value\":\"\\u007f\\u0080\\u009f\xC2\xA0\"}\n"));
     EXPECT_THAT(json, HasSubstr("\n{\"key\":\"nul\",\"value\":\"a\\u0000b\"}\n"));
     EXPECT_THAT(json, HasSubstr("\n{\"key_base64\":\"/w==\",\"value\":\"\"}\n"));
     EXPECT_EQ(loaded({"load", "--json", "--replace"}, json),

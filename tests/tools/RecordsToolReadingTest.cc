@@ -109,8 +109,9 @@ TEST_F(ReadingTest, AListThatIsReadKeyByKeyDoesNotDeadlock) {
     for (int i = 100; i < 160; ++i)  // more than a pipe holds
         records.emplace_back(std::string(2000, 'k') + std::to_string(i), std::to_string(i) + "\n");
     writeFile(data, fileOf(records));
-    const ChildResult result =
-        shell("$tool list | while read -r k; do $tool get \"$k\" && $tool put \"$k\" new; done");
+    const ChildResult result = shell(
+        "$tool list | while read -r k; do"
+        " $tool get \"$k\" && $tool put --wait 20 \"$k\" new || exit 1; done");
     EXPECT_EQ(result.status, 0);
     EXPECT_EQ(result.err, "");
     EXPECT_EQ(std::count(result.out.begin(), result.out.end(), '\n'), 60);

@@ -191,8 +191,16 @@ void toNobody() {
 
 TEST_F(SafetyTest, AReaderThatIsGoneEndsReadingSilentlyByTheSignal) {
     EXPECT_EQ(run({"put", "a", std::string(100000, 'x')}).status, 0);
-    for (const std::vector<std::string>& arguments : std::vector<std::vector<std::string>>{
-             {"get", "a"}, {"list"}, {"dump"}, {"check"}, {"stats"}, {"--help"}}) {
+    writeFile(dir.file("other"), fileOf({}));
+    for (const std::vector<std::string>& arguments :
+         std::vector<std::vector<std::string>>{{"get", "a"},
+                                               {"list"},
+                                               {"dump"},
+                                               {"check"},
+                                               {"stats"},
+                                               {"diff", dir.file("other")},
+                                               {"salvage"},
+                                               {"--help"}}) {
         const ChildResult result = run(arguments, "", [] {
             signal(SIGPIPE, SIG_DFL);
             toNobody();
@@ -213,12 +221,14 @@ TEST_F(SafetyTest, WhoIgnoresTheSignalIsToldThatTheOutputIsLost) {
 }
 
 TEST_F(SafetyTest, AReaderThatIsGoneEndsNoChange) {
-    const ChildResult result = run({"batch"}, "put\ta\t1\n", [] {
+    const auto nobodyReads = [] {
         signal(SIGPIPE, SIG_DFL);
         toNobody();
-    });
-    EXPECT_EQ(result.status, 4);
+    };
+    EXPECT_EQ(run({"batch"}, "put\ta\t1\n", nobodyReads).status, 4);
     EXPECT_EQ(stored(), fileOf({{"a", "1"}}));
+    EXPECT_EQ(run({"salvage", "-o", dir.file("fresh")}, "", nobodyReads).status, 4);
+    EXPECT_EQ(readFile(dir.file("fresh")), stored());
 }
 
 TEST_F(SafetyTest, LostHelpIsNoticed) {

@@ -216,6 +216,18 @@ TEST_F(DamagedFileTest, WhereKeysMightBeValuesNothingIsBelieved) {
               fileOf({many[0]}));
 }
 
+TEST_F(DamagedFileTest, ARefusedKeyThatADamagedLengthMadeInventsNoRecords) {
+    // The version's key grew up to b, whose key is its value then, and values would be keys.
+    const Pairs many{{"a", "a value"}, {"b", "b value"}, {"c", "c value"},
+                     {"d", "d value"}, {"e", "e value"}, {"f", "f value"}};
+    EXPECT_EQ(
+        salvaged(with(fileOf(many), 0, number(31 + 16 - 4)),
+                 "gap at offset 0: 31 bytes, 1 record gone: key \"_record-file-version\\03\\00\\00"
+                 "\\002.0\\01\\00\\00\\00a\\07\\00\\00\\00a value\" is taken for the version\n"
+                 "6 records salvaged, 1 gap\n"),
+        fileOf(many));
+}
+
 TEST_F(DamagedFileTest, OfTwoRecordsWithOneKeyTheFirstOneIsTaken) {
     EXPECT_EQ(salvaged(file + recordBytes("b", "later") + recordBytes("e", "fifth"),
                        "gap at offset 89: 14 bytes, 1 record gone: key \"b\" stands twice\n"

@@ -128,6 +128,18 @@ TEST_F(WritingTest, ADanglingLinkIsRefused) {
     EXPECT_FALSE(std::filesystem::exists(dir.file("not-mounted")));
 }
 
+TEST_F(WritingTest, ADanglingLinkToTheDirectoryIsRefused) {
+    const std::string hashDb = dir.file("db/hashDb");
+    std::filesystem::remove_all(hashDb);
+    std::filesystem::create_symlink(dir.file("not-mounted"), hashDb);
+    for (const std::vector<std::string>& arguments : std::vector<std::vector<std::string>>{
+             {"put", "b", "2"}, {"--create", "put", "b", "2"}, {"list"}}) {
+        expectRefused(arguments, hashDb + ": a symbolic link to a file that is not there");
+    }
+    EXPECT_TRUE(std::filesystem::is_symlink(hashDb));
+    EXPECT_FALSE(std::filesystem::exists(dir.file("not-mounted")));
+}
+
 TEST_F(WritingTest, LinksToTheFileAreFollowedAndItsDirectoryIsUsed) {
     std::filesystem::create_directory(dir.file("real"));
     std::filesystem::rename(data, dir.file("real/records"));
@@ -347,6 +359,23 @@ TEST_F(TracedWriting, AFirstWriterThatIsKilledLeavesNoFileOrAWholeOneAndTheNextR
     EXPECT_EQ(stored(), before);
 }
 
+TEST_F(TracedWriting, AnotherFirstWriterMayMakeTheDirectoryMeanwhile) {
+    if (isEmulated()) GTEST_SKIP() << "the emulator has no ptrace";
+    const std::string hashDb = dir.file("db/hashDb");
+    int made = 0;
+    for (int k = 1;; ++k) {
+        std::filesystem::remove_all(hashDb);
+        const int status = runWith(k, {"--create", "put", "a", "1"}, [&] {
+            made += std::filesystem::create_directory(hashDb) ? 1 : 0;
+            return true;
+        });
+        if (ended()) break;
+        ASSERT_EQ(status, 0) << k;
+        ASSERT_EQ(stored(), before) << k;
+    }
+    EXPECT_GT(made, 10);
+}
+
 TEST_F(TracedWriting, WhatAnotherProgramWritesMeanwhileIsNotOverwritten) {
     if (isEmulated()) GTEST_SKIP() << "the emulator has no ptrace";
     const std::string theirs = fileOf({{"a", "1"}, {"server", "wrote"}});
@@ -362,6 +391,25 @@ TEST_F(TracedWriting, WhatAnotherProgramWritesMeanwhileIsNotOverwritten) {
         if (status != 4) continue;
         ++refused;
         ASSERT_EQ(stored(), theirs) << k;
+    }
+    EXPECT_GT(refused, 10);
+}
+
+TEST_F(TracedWriting, AModeThatIsSetMeanwhileIsNotSetBack) {
+    if (isEmulated()) GTEST_SKIP() << "the emulator has no ptrace";
+    int refused = 0;
+    for (int k = 1;; k += 3) {
+        writeFile(data, before);
+        ASSERT_EQ(chmod(data.c_str(), 0600), 0);
+        const int status =
+            runWith(k, {"put", "b", "2"}, [&] { return chmod(data.c_str(), 0640) == 0; });
+        if (ended()) break;
+        if (status != 4) continue;
+        ++refused;
+        struct stat st {};
+        ASSERT_EQ(stat(data.c_str(), &st), 0);
+        ASSERT_EQ(st.st_mode & 07777U, 0640U) << k;
+        ASSERT_EQ(stored(), before) << k;
     }
     EXPECT_GT(refused, 10);
 }

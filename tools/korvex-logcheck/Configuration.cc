@@ -63,20 +63,20 @@ void hearAppender(Configuration& config, const ConfigStatement& said) {
     }
 }
 
-void hearCategory(Configuration& config, const ConfigStatement& said) {
-    Channel* known = named(config.categories, said.name);
-    if (known == nullptr) {
-        config.categories.push_back({said.name, LogChannel::find(said.name, false), {}});
-        known = &config.categories.back();
-    }
-    known->statements.push_back(said);
+// Where each category stands; there may be thousands.
+using Places = std::map<std::string, std::size_t>;
+
+void hearCategory(Configuration& config, Places& places, const ConfigStatement& said) {
+    const auto [place, first] = places.emplace(said.name, config.categories.size());
+    if (first) config.categories.push_back({said.name, LogChannel::find(said.name, false), {}});
+    config.categories[place->second].statements.push_back(said);
 }
 
-void hear(Configuration& config, const ConfigStatement& said) {
+void hear(Configuration& config, Places& places, const ConfigStatement& said) {
     if (said.kind == ConfigStatement::ROOT) {
         config.root.statements.push_back(said);
     } else if (said.kind == ConfigStatement::CATEGORY) {
-        hearCategory(config, said);
+        hearCategory(config, places, said);
     } else {
         hearAppender(config, said);
     }
@@ -94,7 +94,8 @@ Configuration Configuration::read(const std::string& text, const Pathname& home)
     const Stream stream = streamOf(text);
     if (!stream) throw std::bad_alloc();
     ConfigReader reader(stream.get(), home);
-    reader.setListener([&](const ConfigStatement& said) { hear(config, said); });
+    Places categories;
+    reader.setListener([&](const ConfigStatement& said) { hear(config, categories, said); });
     reader.readAll();
     reader.applyRoot();
     reader.applyCategories();

@@ -12,7 +12,7 @@ namespace {
 constexpr std::size_t kMost = 1U << 20U;  // of no configuration, but of a device without an end
 
 [[noreturn]] void unreadable(const std::string& name, const std::string& why) {
-    throw Failure("cannot read " + printable(name) + ": " + why);
+    throw Failure("cannot read " + visible(name) + ": " + why);
 }
 
 std::string readAll(std::FILE* file, const std::string& name) {

@@ -1,5 +1,4 @@
 #include <algorithm>
-#include <csignal>
 #include <cstdio>
 #include <exception>
 
@@ -71,7 +70,8 @@ void exportOnly(const Options& options) {
 }
 
 void complain(const std::exception& e) {
-    std::fprintf(stderr, "korvex-logcheck: %s\n", e.what());
+    // An option that there is not is quoted in it as it was given.
+    std::fprintf(stderr, "korvex-logcheck: %s\n", printable(e.what()).c_str());
 }
 
 // One file that cannot be read does not keep the others from being checked.
@@ -90,8 +90,6 @@ Status checkAll(const Options& options) {
 }
 
 Status run(int argc, char** argv) {
-    // A reader that is gone is told by the write that fails.
-    std::signal(SIGPIPE, SIG_IGN);
     const Options options = parseOptions(argc, argv);
     Status status = CLEAN;
     if (options.mode == Options::CODES) {

@@ -1,5 +1,6 @@
 #include "Options.h"
 
+#include <algorithm>
 #include <cstdlib>
 
 #include "Status.h"
@@ -84,6 +85,9 @@ void check(const Options& options) {
         return;
     }
     if (options.files.empty()) throw Failure("no configuration file given; see --help");
+    if (std::count(options.files.begin(), options.files.end(), "-") > 1) {
+        throw Failure("standard input can be read once only");
+    }
     const bool takesOne = options.mode == Options::FIX || options.mode == Options::EXPORT;
     if (takesOne && options.files.size() > 1) {
         throw Failure(options.mode == Options::FIX ? "--fix takes one file at a time"

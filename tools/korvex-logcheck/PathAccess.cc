@@ -67,6 +67,28 @@ Answer askDirectory(const std::string& directory) {
     return {false, Code::PATH_NO_DIRECTORY, quoted(directory) + " is no directory"};
 }
 
+// In a directory as /tmp is, the owner of a file alone renames it.
+bool isHeldByOwner(const std::string& directory, const std::string& name) {
+    struct stat above {};
+    struct stat entry {};
+    if (stat(directory.c_str(), &above) != 0 || lstat(name.c_str(), &entry) != 0) return false;
+    const uid_t user = geteuid();
+    return (above.st_mode & S_ISVTX) != 0 && user != 0 && user != above.st_uid &&
+           user != entry.st_uid;
+}
+
+Answer askRotation(const WantedFile& file) {
+    if (!file.rotates) return kGood;
+    const std::string directory = directoryOf(file.name);
+    const bool usable = mayUse(directory, W_OK | X_OK);
+    if (usable && !isHeldByOwner(directory, file.name)) return kGood;
+    return {
+        false, Code::PATH_NO_ROTATION,
+        (usable ? quoted(file.name) + " cannot be renamed: only its owner can, in this directory"
+                : "nothing can be renamed in " + quoted(directory) + ": " + reason()) +
+            "; the file grows beyond maxFileSize"};
+}
+
 Answer askExisting(const WantedFile& file, const struct stat& st) {
     if (S_ISDIR(st.st_mode)) {
         return {false, Code::PATH_NO_DIRECTORY, quoted(file.name) + " is a directory"};
@@ -74,11 +96,7 @@ Answer askExisting(const WantedFile& file, const struct stat& st) {
     if (!mayUse(file.name, W_OK)) {
         return {false, Code::PATH_DENIED, quoted(file.name) + " cannot be written: " + reason()};
     }
-    const std::string directory = directoryOf(file.name);
-    if (!file.rotates || mayUse(directory, W_OK | X_OK)) return kGood;
-    return {false, Code::PATH_NO_ROTATION,
-            "nothing can be renamed in " + quoted(directory) + ": " + reason() +
-                "; the file grows beyond maxFileSize"};
+    return askRotation(file);
 }
 
 Answer ask(const WantedFile& file, int links) {
@@ -91,7 +109,8 @@ Answer ask(const WantedFile& file, int links) {
     // A link to what is not there yet: that is made.
     const std::string to(target, static_cast<std::size_t>(size));
     const std::string name = to.front() == '/' ? to : directoryOf(file.name) + '/' + to;
-    return ask({name, file.rotates}, links - 1);
+    const Answer answer = ask({name, false}, links - 1);
+    return answer.good ? askRotation(file) : answer;
 }
 
 }  // namespace

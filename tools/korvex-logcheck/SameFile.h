@@ -7,6 +7,7 @@
 // What a name of a file leads to.
 struct FileIdentity {
     std::string canonical;  // normalised, and links followed as far as there are any
+    std::string entry;      // the same, but for a link that the last component is
     bool isDevice;          // or anything else that takes lines from any number
     bool exists;
     dev_t device;

@@ -29,17 +29,24 @@ Timeval sampleTime() {
     return time;
 }
 
+// Whether a conversion of the text has a width of six digits and more, behind its flags.
+bool hasHugeWidth(std::string_view text) {
+    constexpr std::size_t most = 5;
+    for (std::size_t pos = 0; (pos = text.find('%', pos)) != text.npos;) {
+        pos = std::min(text.find_first_not_of("-_0^#+", pos + 1), text.size());
+        const std::size_t end = std::min(text.find_first_not_of("0123456789", pos), text.size());
+        if (end - pos > most) return true;
+    }
+    return false;
+}
+
 // Whether the pattern pads something to a width of six digits and more: surely a slip, and not
 // worth gigabytes of blanks here.
 bool isHuge(const std::string& pattern) {
-    const auto digits = [&](std::size_t from) {
-        return std::min(pattern.find_first_not_of("0123456789", from), pattern.size()) - from;
-    };
-    for (std::size_t pos = 0; (pos = pattern.find('%', pos)) != pattern.npos;) {
-        pos = std::min(pattern.find_first_not_of("-_0^#+", pos + 1), pattern.size());
-        if (digits(pos) >= 6) return true;
-    }
-    return false;
+    const std::vector<PatternPart> parts = partsOf(pattern);
+    return std::any_of(parts.begin(), parts.end(), [&](const PatternPart& part) {
+        return part.kind == PatternPart::CONVERSION && hasHugeWidth(part.in(pattern));
+    });
 }
 
 // What the conversions print that change from one moment to the next; null: another one.

@@ -3,6 +3,8 @@
 #include <algorithm>
 #include <cstdint>
 #include <cstdio>
+#include <iterator>
+#include <utility>
 
 namespace {
 
@@ -20,10 +22,36 @@ std::uint32_t decoded(std::string_view character) {
     return value;
 }
 
-// What a terminal obeys or does not show.
+// What a terminal obeys or does not show, or shows as a blank.
 bool isHidden(std::uint32_t c) {
-    return c < 0x20 || (c >= 0x7F && c <= 0xA0) || c == 0xAD || (c >= 0x200B && c <= 0x200F) ||
-           (c >= 0x2028 && c <= 0x202F) || (c >= 0x2060 && c <= 0x206F) || c == 0xFEFF;
+    static constexpr std::pair<std::uint32_t, std::uint32_t> kRanges[] = {
+        {0x00, 0x1F},     {0x7F, 0xA0},       {0xAD, 0xAD},     {0x61C, 0x61C},   {0x115F, 0x1160},
+        {0x1680, 0x1680}, {0x180E, 0x180E},   {0x2000, 0x200F}, {0x2028, 0x202F}, {0x205F, 0x206F},
+        {0x3000, 0x3000}, {0x3164, 0x3164},   {0xFE00, 0xFE0F}, {0xFEFF, 0xFEFF}, {0xFFA0, 0xFFA0},
+        {0xFFF9, 0xFFFB}, {0xE0000, 0xE0FFF},
+    };
+    return std::any_of(std::begin(kRanges), std::end(kRanges),
+                       [=](const auto& range) { return c >= range.first && c <= range.second; });
+}
+
+struct Quotes {
+    std::string_view open;
+    std::string_view close;
+};
+
+// Those of the keyboard, and those that word processors make of them.
+constexpr Quotes kQuotes[] = {
+    {"\"", "\""},
+    {"'", "'"},
+    {"\xE2\x80\x9C", "\xE2\x80\x9D"},  // of English
+    {"\xE2\x80\x98", "\xE2\x80\x99"},
+    {"\xE2\x80\x9E", "\xE2\x80\x9C"},  // of German
+    {"\xC2\xAB", "\xC2\xBB"},          // of French
+};
+
+bool isAround(const Quotes& quotes, std::string_view text) {
+    return text.size() > quotes.open.size() + quotes.close.size() &&
+           beginsWith(text, quotes.open) && endsWith(text, quotes.close);
 }
 
 void addEscaped(std::string& to, std::string_view bytes) {
@@ -99,11 +127,35 @@ std::string listed(const std::vector<std::string>& items) {
 }
 
 std::string_view withoutQuotes(std::string_view text) {
-    while (text.size() > 2 && (text.front() == '"' || text.front() == '\'') &&
-           text.back() == text.front()) {
-        text = text.substr(1, text.size() - 2);
+    for (;;) {
+        const auto* const quotes =
+            std::find_if(std::begin(kQuotes), std::end(kQuotes),
+                         [=](const Quotes& each) { return isAround(each, text); });
+        if (quotes == std::end(kQuotes)) return text;
+        text.remove_prefix(quotes->open.size());
+        text.remove_suffix(quotes->close.size());
+    }
+}
+
+std::string_view withoutLoneQuote(std::string_view text) {
+    for (const Quotes& quotes : kQuotes) {
+        for (const std::string_view quote : {quotes.open, quotes.close}) {
+            if (text.size() <= quote.size() || text.find(quote) != text.rfind(quote)) continue;
+            if (beginsWith(text, quote)) return text.substr(quote.size());
+            if (endsWith(text, quote)) return text.substr(0, text.size() - quote.size());
+        }
     }
     return text;
+}
+
+std::string shortened(std::string_view text) {
+    constexpr std::size_t most = 500;
+    if (text.size() <= most) return std::string(text);
+    std::size_t size = most;
+    // Not within a character.
+    while (size > most - 3 && isContinuation(text[size]))
+        --size;
+    return std::string(text.substr(0, size)) + "...";
 }
 
 std::string lowered(std::string_view text) {

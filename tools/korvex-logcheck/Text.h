@@ -28,6 +28,12 @@ std::string listed(const std::vector<std::string>& items);
 // Without the quotation marks around it, however many; itself when there are none, or nothing else.
 std::string_view withoutQuotes(std::string_view text);
 
+// Without a quotation mark that stands at its beginning or at its end and nowhere else.
+std::string_view withoutLoneQuote(std::string_view text);
+
+// Its first 500 bytes or so and "...", where it is longer: what is quoted is to be read.
+std::string shortened(std::string_view text);
+
 // In lower case, as far as ASCII goes.
 std::string lowered(std::string_view text);
 

@@ -8,6 +8,7 @@
 #include <cstdio>
 #include <cstdlib>
 #include <exception>
+#include <new>
 
 #include "commands/Commands.h"
 #include "support/StandardOutput.h"
@@ -66,7 +67,7 @@ Status run(int argc, char** argv, char** envp) {
         const Command& command = findCommand(options);
         // A reader that is gone ends what only reads, as it does other tools. It must not end a
         // change in its middle; then the write that fails tells.
-        if (command.writes) std::signal(SIGPIPE, SIG_IGN);
+        if (command.writes || options.output) std::signal(SIGPIPE, SIG_IGN);
         std::signal(SIGXFSZ, SIG_IGN);
         if (command.run != runHelp) setUp(options, argc, argv, envp);
         const ProgressDisplay display;
@@ -85,6 +86,9 @@ int main(int argc, char** argv, char** envp) {
     } catch (const Failure& failure) {
         complain(failure.what());
         return failure.status();
+    } catch (const std::bad_alloc&) {
+        complain("out of memory");
+        return IO_ERROR;
     } catch (const std::exception& e) {  // the output is lost, for one
         complain(e.what());
         return IO_ERROR;

@@ -5,6 +5,7 @@
 #include <cstring>
 
 #include "terminal/Progress.h"
+#include "text/Escape.h"
 
 std::string withErrno(const std::string& message) {
     return message + ": " + std::strerror(errno);
@@ -12,5 +13,5 @@ std::string withErrno(const std::string& message) {
 
 void complain(const std::string& message) {
     progressAside();
-    std::fprintf(stderr, "korvex-records: %s\n", message.c_str());
+    std::fprintf(stderr, "korvex-records: %s\n", withoutControls(message).c_str());
 }

@@ -27,5 +27,5 @@ class Failure : public std::runtime_error {
 // "MESSAGE: what errno says".
 std::string withErrno(const std::string& message);
 
-// Writes "korvex-records: MESSAGE" to standard error.
+// Writes "korvex-records: MESSAGE" to standard error, its control characters escaped.
 void complain(const std::string& message);

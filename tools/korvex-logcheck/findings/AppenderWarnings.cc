@@ -1,9 +1,11 @@
 #include <algorithm>
+#include <cstring>
 
 #include "Text.h"
 #include "findings/Attributes.h"
 #include "findings/Findings.h"
 #include "findings/Levels.h"
+#include "findings/MeantAppender.h"
 
 namespace {
 
@@ -40,6 +42,9 @@ bool isMeantForFile(const Reading& reading, const Appender& appender) {
 }
 
 void checkFile(const Reading& reading, const Appender& appender, Findings& to) {
+    const bool told = isMeantToBeSet(reading.config, reading.source, appender, "fileName") ||
+                      !meantAppender(reading.config, appender).empty();
+    if (told) return;
     for (const std::string_view complaint : appender.complaints) {
         if (complaint.find("has no filename") != 0) continue;
         const bool file = isMeantForFile(reading, appender);
@@ -55,8 +60,13 @@ bool isMeantToBeUsed(const Reading& reading, const Appender& appender, const Fin
     for (const auto& [lineno, text] : reading.config.parseErrors) {
         const std::string& line = reading.source.line(lineno).text;
         const std::size_t sign = line.find_first_of("=:");
-        if (sign == line.npos || line.find("appender.") < sign) continue;
-        const std::vector<std::string> words = wordsOf(std::string_view(line).substr(sign + 1));
+        if (line.find("appender.") < std::min(sign, line.size())) continue;
+        std::string value = sign == line.npos ? line : line.substr(sign + 1);
+        // What people put between words where a comma belongs.
+        std::replace_if(
+            value.begin(), value.end(), [](char c) { return std::strchr(";|&+/", c) != nullptr; },
+            ' ');
+        const std::vector<std::string> words = wordsOf(value);
         if (std::count(words.begin(), words.end(), appender.name) > 0) return true;
     }
     return std::any_of(told.begin(), told.end(), [&](const Finding& finding) {
@@ -72,7 +82,8 @@ void checkUse(const Reading& reading, const Appender& appender, Findings& to) {
                     called(appender) + " is spelt like a level: no category can name it");
     }
     if (reading.config.users(*appender.made).empty() && !isMeantToBeUsed(reading, appender, to)) {
-        tell(to, Code::APPENDER_UNUSED, place, called(appender) + " is used by nobody");
+        tell(to, Code::APPENDER_UNUSED, place, called(appender) + " is used by nobody",
+             meantAppender(reading.config, appender));
     }
 }
 
@@ -84,10 +95,18 @@ void checkRootAppender(const Reading& reading, Findings& to) {
     }
 }
 
+// Whether it is there only by attributes that are refused, and so told.
+bool isOnlyRefused(const Appender& appender) {
+    return appender.declarations.empty() &&
+           std::none_of(appender.attributes.begin(), appender.attributes.end(),
+                        [](const ConfigStatement& said) { return said.accepted; });
+}
+
 }  // namespace
 
 void findInAppenders(const Reading& reading, Findings& to) {
     for (const Appender& appender : reading.config.appenders) {
+        if (isOnlyRefused(appender)) continue;
         checkDeclared(reading, appender, to);
         checkFile(reading, appender, to);
         checkUse(reading, appender, to);

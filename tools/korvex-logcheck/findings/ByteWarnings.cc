@@ -20,9 +20,10 @@ void findLineEnds(const Source& source, Findings& to) {
     for (const std::size_t offset : returns)
         edits.push_back({offset, offset + 1, ""});
     tell(to, Code::BYTES_CRLF, source.placeOf(returns.front()),
-         counted(returns.size(), "line") +
-             " of the file, from this one on, end as on Windows: the carriage return becomes part "
-             "of the last word, number or file name",
+         counted(returns.size(), "line") + " of the file, from this one on, " +
+             (returns.size() == 1 ? "ends" : "end") +
+             " as on Windows: the carriage return becomes part of the last word, number or file "
+             "name",
          {}, std::move(edits));
 }
 

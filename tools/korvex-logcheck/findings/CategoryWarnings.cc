@@ -1,4 +1,5 @@
 #include <algorithm>
+#include <map>
 #include <set>
 
 #include "Text.h"
@@ -39,10 +40,25 @@ void checkRoot(const Reading& reading, Findings& to) {
     checkWords(reading, "the root category", lines.back(), to);
 }
 
-std::string withoutWildcard(std::string name) {
-    while (!name.empty() && (name.back() == '*' || name.back() == '.'))
-        name.pop_back();
-    return name.empty() ? "rootCategory" : name;
+std::string withoutWildcard(const std::string& name) {
+    constexpr std::string_view signs = "*?.";
+    const std::size_t last = name.find_last_not_of(signs);
+    if (last == name.npos) return "rootCategory";
+    const std::size_t first = name.find_first_not_of(signs);
+    return name.substr(first, last - first + 1);
+}
+
+bool hasWildcard(const std::string& name) {
+    if (name.empty()) return false;
+    return name.find_first_of("*?") != name.npos || name.front() == '.' || name.back() == '.';
+}
+
+// What it says of the category where others have attributes, as ".level"; empty: nothing.
+std::string_view attributeOf(std::string_view name) {
+    for (const std::string_view one : {".level", ".priority", ".appender", ".appenders"}) {
+        if (name.size() > one.size() && endsWith(name, one)) return one;
+    }
+    return "";
 }
 
 void checkName(const Channel& category, const Place& place, Findings& to) {
@@ -53,45 +69,58 @@ void checkName(const Channel& category, const Place& place, Findings& to) {
         tell(to, Code::CATEGORY_LEVEL_NAME, place,
              who + " is spelt like a level; the root's level is set by rootCategory");
     }
-    if (name.empty() || name.find_first_of(" \t") != name.npos) {
+    if (name.empty() || name.find_first_of(" \t,\"'") != name.npos) {
         tell(to, Code::CATEGORY_BLANK, place,
-             who + " has an empty name or a blank in it, as no logger is called");
+             who +
+                 (name.empty() ? " has an empty name"
+                               : " has a blank, a comma or a quotation mark in its name") +
+                 ", as no logger is called",
+             std::string(withoutQuotes(name) == name ? "" : withoutQuotes(name)));
     }
     if (low == "root" || low == "rootcategory" || low == "rootlogger") {
         tell(to, Code::CATEGORY_ROOT, place,
              who + " is one like any other; what all others inherit from is set by rootCategory",
              "rootCategory");
     }
-    if (name.find('*') != name.npos || (!name.empty() && name.back() == '.')) {
+    if (hasWildcard(name)) {
         tell(to, Code::CATEGORY_WILDCARD, place,
              who + " is a logger of just that name: there are no wildcards, and names are flat",
              withoutWildcard(name));
     }
+    if (const std::string_view attribute = attributeOf(low); !attribute.empty()) {
+        tell(to, Code::CATEGORY_ATTRIBUTE, place,
+             who +
+                 " is a logger of just that name: a category has no attributes, its value gives "
+                 "its level and its appenders",
+             name.substr(0, name.size() - attribute.size()));
+    }
 }
 
+// The categories so far, by their names in lower case.
+using Seen = std::map<std::string, const Channel*>;
+
 // Of two categories that differ in case only, one is a slip.
-void checkCase(const Configuration& config, const Channel& category, const Place& place,
-               Findings& to) {
-    for (const Channel& other : config.categories) {
-        if (&other == &category) return;
-        if (lowered(other.name) != lowered(category.name)) continue;
-        return tell(to, Code::CATEGORY_CASE, place,
-                    "category " + quoted(category.name) + " and category " + quoted(other.name) +
-                        ", line " + std::to_string(other.statements.front().lineno) +
-                        ", differ in case only and are two",
-                    other.name);
-    }
+void checkCase(Seen& seen, const Channel& category, const Place& place, Findings& to) {
+    const auto [other, first] = seen.emplace(lowered(category.name), &category);
+    if (first) return;
+    const std::string& name = other->second->name;
+    tell(to, Code::CATEGORY_CASE, place,
+         "category " + quoted(category.name) + " and category " + quoted(name) + ", line " +
+             std::to_string(other->second->statements.front().lineno) +
+             ", differ in case only and are two",
+         name);
 }
 
 }  // namespace
 
 void findInCategories(const Reading& reading, Findings& to) {
     checkRoot(reading, to);
+    Seen seen;
     for (const Channel& category : reading.config.categories) {
         const ConfigStatement& first = category.statements.front();
         const Place place = nameOf(reading.source, first).place();
         checkName(category, place, to);
-        checkCase(reading.config, category, place, to);
+        checkCase(seen, category, place, to);
         for (const ConfigStatement& said : category.statements) {
             checkWords(reading, "category " + quoted(category.name), said, to);
             if (&said == &first) continue;

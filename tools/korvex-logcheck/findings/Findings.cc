@@ -32,7 +32,7 @@ Findings findAll(const Source& source, const Wanted& wanted) {
     const Reading reading{source, config};
     for (const auto find :
          {findInKeys, findInWords, findInCategories, findInLevels, findInAttributes, findInValues,
-          findInAppenders, findInFiles, findInLimits, findInLayouts, findInPatterns}) {
+          findInAppenders, findInFiles, findInLimits, findInPatterns, findInLayouts}) {
         find(reading, all);
     }
     if (wanted.paths) findInPaths(reading, *wanted.paths, all);
@@ -76,5 +76,12 @@ Place placeOf(const Source& source, unsigned lineno) {
 }
 
 std::string parseError(const Reading& reading, unsigned lineno) {
-    return "Parse error at " + quoted(reading.config.parseErrors.at(lineno)) + ": ";
+    return "Parse error at " + quoted(shortened(reading.config.parseErrors.at(lineno))) + ": ";
+}
+
+void tellAdditivity(Findings& to, const Place& place, const std::string& error) {
+    tell(to, Code::KEY_ADDITIVITY, place,
+         error +
+             "there is no additivity: names are flat, and a category that names an appender writes "
+             "to no other");
 }

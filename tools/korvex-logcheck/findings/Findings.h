@@ -55,8 +55,9 @@ void findInValues(const Reading& reading, Findings& to);
 void findInAppenders(const Reading& reading, Findings& to);
 void findInFiles(const Reading& reading, Findings& to);
 void findInLimits(const Reading& reading, Findings& to);
-void findInLayouts(const Reading& reading, Findings& to);
 void findInPatterns(const Reading& reading, Findings& to);
+// Of layouts as a whole, where patterns are told already.
+void findInLayouts(const Reading& reading, Findings& to);
 void findInPaths(const Reading& reading, const Writer& writer, Findings& to);
 // The argument of a %d, for findInPatterns().
 void findInDate(const Piece& argument, Findings& to);
@@ -73,6 +74,9 @@ Piece attributeOf(const Source& source, const ConfigStatement& said);
 Place placeOf(const Source& source, const ConfigStatement& said);
 // The first character of a line's content that is no blank.
 Place placeOf(const Source& source, unsigned lineno);
+
+// There is no additivity.
+void tellAdditivity(Findings& to, const Place& place, const std::string& error);
 
 // Begins the message of a line that the library refuses as the library does.
 std::string parseError(const Reading& reading, unsigned lineno);

@@ -86,3 +86,12 @@ JavaDate javaDate(std::string_view text) {
     sure = sure && pattern.find("%%") == pattern.npos && pattern.find('}') == pattern.npos;
     return {twoDigits, twoDigits && sure ? pattern : ""};
 }
+
+bool hasJavaFieldsOnly(std::string_view letters) {
+    while (!letters.empty()) {
+        const std::string_view run = runOf(letters);
+        if (run.size() < 2 || fieldOf(run) == nullptr) return false;
+        letters.remove_prefix(run.size());
+    }
+    return true;
+}

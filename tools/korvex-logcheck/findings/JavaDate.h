@@ -11,3 +11,7 @@ struct JavaDate {
     std::string pattern;  // empty: there is none
 };
 JavaDate javaDate(std::string_view text);
+
+// Whether letters among conversions of strftime are fields of Java that no word looks like: "ss",
+// "HHmm".
+bool hasJavaFieldsOnly(std::string_view letters);

@@ -54,6 +54,13 @@ bool looksLikeComment(std::string_view text) {
     return false;
 }
 
+// Whether the line before it, in the file, ends in a backslash.
+bool isContinued(const Source& source, const SourceLine& line) {
+    const std::string_view before = std::string_view(source.bytes()).substr(0, line.begin);
+    const std::size_t last = before.find_last_not_of("\r\n");
+    return last != before.npos && before[last] == '\\';
+}
+
 // Why the library understands nothing.
 std::string reasonFor(std::string_view text, const std::string& word) {
     const bool named = beginsWith(text, "category.") || beginsWith(text, "appender.");
@@ -75,11 +82,10 @@ void explain(const Reading& reading, const SourceLine& line, Findings& to) {
     text.remove_prefix(std::min(text.find_first_not_of(" \t"), text.size()));
     if (beginsWith(text, "log4cpp.")) text.remove_prefix(8);
     const std::string word(text.substr(0, text.find_first_of(".= \t")));
-    if (lowered(word) == "additivity") {
-        return tell(to, Code::KEY_ADDITIVITY, place,
-                    error +
-                        "there is no additivity: names are flat, and a category that names an "
-                        "appender writes to no other");
+    if (lowered(word) == "additivity") return tellAdditivity(to, place, error);
+    if (isContinued(reading.source, line)) {
+        return tell(to, Code::KEY_UNKNOWN, place,
+                    error + "a backslash does not carry a line on to the next one");
     }
     tell(to, Code::KEY_UNKNOWN, place, error + reasonFor(text, word),
          nearestTo(word, {"rootCategory", "category", "appender"}));

@@ -83,9 +83,17 @@ class KeyReader {
                 note(low == lowered(meant) ? Code::KEY_CASE : Code::KEY_OTHER_NAME);
             }
             _key += meant;
-            return meant == "rootCategory" || readName(meant == "appender");
+            _logger = name == "logger";
+            if (meant == "rootCategory") return name != "rootlogger" || !at('.') || skipLevel();
+            return readName(meant == "appender");
         }
         return false;
+    }
+
+    // "rootLogger.level": what else a later version of another library says there is nothing here.
+    bool skipLevel() {
+        ++_pos;
+        return lowered(upTo("=: \t")) == "level";
     }
 
     bool readName(bool appender) {
@@ -100,12 +108,23 @@ class KeyReader {
                 name.pop_back();
                 --_pos;
             }
+            if (_logger && endsWith(lowered(name), ".level")) {
+                name.resize(name.size() - std::string_view(".level").size());
+            } else if (_logger && saysMoreThanItsName(lowered(name))) {
+                return false;
+            }
             _key += name;
             return true;
         }
         const std::string name = upTo(".=: \t");
         _key += name;
         return !name.empty() && (!at('.') || readAttribute());
+    }
+
+    // "net.additivity", which is no logger's name.
+    static bool saysMoreThanItsName(const std::string& name) {
+        return endsWith(name, ".name") || endsWith(name, ".additivity") ||
+               name.find(".appenderref") != name.npos;
     }
 
     bool readAttribute() {
@@ -120,6 +139,7 @@ class KeyReader {
     const std::string& _line;
     std::size_t _pos = 0;
     std::string _key;
+    bool _logger = false;
     std::optional<Code> _slip;
 };
 

@@ -1,3 +1,5 @@
+#include <algorithm>
+
 #include "Sample.h"
 #include "Text.h"
 #include "findings/Attributes.h"
@@ -24,17 +26,34 @@ void checkChoice(const Reading& reading, const Appender& appender, Findings& to)
             chosen = &said;
         }
     }
-    if (announced != nullptr && chosen == nullptr) {
+    if (announced != nullptr && chosen == nullptr &&
+        !isMeantToBeSet(reading.config, reading.source, appender, kPattern)) {
         tell(to, Code::LAYOUT_NO_PATTERN, attributeOf(reading.source, *announced).place(),
              "PatternLayout of " + quoted(appender.name) + " comes without " + kPattern +
                  ": the layout is " + quoted(appender.made->layout().pattern()));
     }
 }
 
-// Slips that are told in their own words, and after which the lines will end.
-bool isMendedIntoLines(std::string_view pattern) {
-    const std::string_view bare = withoutQuotes(pattern);
-    return endsWith(bare, "\\n") || (bare != pattern && endsWith(bare, "%n"));
+// Whether something is told of the layout's line from which it follows that the lines do not end.
+bool isTold(const Findings& told, const ConfigStatement& said) {
+    return std::any_of(told.begin(), told.end(), [&](const Finding& finding) {
+        if (finding.place.line != said.lineno) return false;
+        switch (finding.code) {
+            case Code::PATTERN_CUT:
+            case Code::PATTERN_HASH:
+            case Code::PATTERN_QUOTED:
+            case Code::COMMENT_OPEN:
+                return true;
+            case Code::VALUE_TAIL:
+                return !finding.meant.empty();
+            case Code::PATTERN_BACKSLASH:
+                return endsWith(said.value, "\\n");
+            case Code::PATTERN_NO_MESSAGE:
+                return said.value.empty();
+            default:
+                return false;
+        }
+    });
 }
 
 void checkSample(const Reading& reading, const Appender& appender, Findings& to) {
@@ -51,7 +70,7 @@ void checkSample(const Reading& reading, const Appender& appender, Findings& to)
         tell(to, wide ? Code::PATTERN_WIDTH : Code::PATTERN_FAILS, place,
              who + ' ' + printable(sample.failure));
     } else if (sample.line.empty() || sample.line.back() != '\n') {
-        if (isMendedIntoLines(appender.made->layout().pattern())) return;
+        if (isTold(to, *last)) return;
         tell(to, Code::PATTERN_NO_NEWLINE, place,
              who + " does not end in %n: its lines run into each other");
     }

@@ -33,11 +33,14 @@ std::string levelInOtherCase(const std::string& word) {
 
 std::string levelOfOtherName(const std::string& word) {
     static constexpr std::pair<const char*, const char*> kNames[] = {
-        {"all", "DEBUG"},       {"trace", "DEBUG"},        {"verbose", "DEBUG"},
-        {"fine", "DEBUG"},      {"informational", "INFO"}, {"information", "INFO"},
-        {"warning", "WARN"},    {"warnings", "WARN"},      {"err", "ERROR"},
-        {"errors", "ERROR"},    {"severe", "ERROR"},       {"critical", "CRIT"},
-        {"emergency", "EMERG"}, {"panic", "EMERG"},        {"off", "EMERG"},
+        {"all", "DEBUG"},     {"trace", "DEBUG"},        {"verbose", "DEBUG"},
+        {"fine", "DEBUG"},    {"finer", "DEBUG"},        {"finest", "DEBUG"},
+        {"dbg", "DEBUG"},     {"informational", "INFO"}, {"information", "INFO"},
+        {"warning", "WARN"},  {"warnings", "WARN"},      {"wrn", "WARN"},
+        {"err", "ERROR"},     {"errors", "ERROR"},       {"severe", "ERROR"},
+        {"critical", "CRIT"}, {"emergency", "EMERG"},    {"panic", "EMERG"},
+        {"off", "EMERG"},     {"none", "EMERG"},         {"disabled", "EMERG"},
+        {"silent", "EMERG"},
     };
     const std::string low = lowered(word);
     for (const auto& [name, level] : kNames) {

@@ -12,9 +12,12 @@ namespace {
 // How many bytes a unit is; 0 for what is none.
 std::uint64_t bytesOf(std::string_view unit) {
     static constexpr std::pair<std::string_view, unsigned> kUnits[] = {
-        {"", 0},     {"b", 0},  {"byte", 0}, {"bytes", 0}, {"k", 10}, {"kb", 10},
-        {"kib", 10}, {"m", 20}, {"mb", 20},  {"mib", 20},  {"g", 30}, {"gb", 30},
-        {"gib", 30}, {"t", 40}, {"tb", 40},  {"tib", 40},
+        {"", 0},        {"b", 0},         {"byte", 0},       {"bytes", 0},      {"k", 10},
+        {"kb", 10},     {"kib", 10},      {"m", 20},         {"mb", 20},        {"mib", 20},
+        {"g", 30},      {"gb", 30},       {"gib", 30},       {"t", 40},         {"tb", 40},
+        {"tib", 40},    {"kbyte", 10},    {"kbytes", 10},    {"kilobyte", 10},  {"kilobytes", 10},
+        {"mbyte", 20},  {"mbytes", 20},   {"megabyte", 20},  {"megabytes", 20}, {"gbyte", 30},
+        {"gbytes", 30}, {"gigabyte", 30}, {"gigabytes", 30},
     };
     const std::string low = lowered(unit);
     for (const auto& [name, shift] : kUnits) {
@@ -62,6 +65,7 @@ std::optional<std::uint64_t> times(const std::string& digits, std::uint64_t unit
 MeantNumber meantNumber(std::string_view text) {
     while (!text.empty() && (text.back() == ' ' || text.back() == '\t' || text.back() == '#'))
         text.remove_suffix(1);
+    text = withoutQuotes(text);
     if (beginsWith(text, "+")) text.remove_prefix(1);
     const std::string digits = takeDigits(text);
     while (!text.empty() && text.front() == ' ')

@@ -5,25 +5,39 @@
 #include "Text.h"
 #include "findings/Attributes.h"
 #include "findings/Findings.h"
+#include "findings/PatternEnd.h"
 
 namespace {
 
 // What other logging libraries spell out; of an empty one there is nothing here.
 constexpr std::pair<std::string_view, std::string_view> kWords[] = {
-    {"message", "m"}, {"msg", "m"},      {"newline", "n"},  {"category", "c"}, {"logger", "c"},
-    {"level", "p"},   {"priority", "p"}, {"thread", "t"},   {"date", "d"},     {"relative", "r"},
-    {"class", ""},    {"method", ""},    {"file", ""},      {"line", ""},      {"location", ""},
-    {"process", ""},  {"pid", ""},       {"throwable", ""}, {"exception", ""},
+    {"message", "m"},     {"msg", "m"},        {"newline", "n"},   {"category", "c"},
+    {"logger", "c"},      {"channel", "c"},    {"name", "c"},      {"level", "p"},
+    {"loglevel", "p"},    {"priority", "p"},   {"severity", "p"},  {"thread", "t"},
+    {"threadname", "t"},  {"threadid", "t"},   {"tid", "t"},       {"date", "d"},
+    {"datetime", "d"},    {"time", "d"},       {"timestamp", "d"}, {"relative", "r"},
+    {"class", ""},        {"method", ""},      {"file", ""},       {"line", ""},
+    {"location", ""},     {"process", ""},     {"processid", ""},  {"pid", ""},
+    {"throwable", ""},    {"exception", ""},   {"ex", ""},         {"nopex", ""},
+    {"nopexception", ""}, {"mdc", ""},         {"ndc", ""},        {"marker", ""},
+    {"caller", ""},       {"contextname", ""}, {"uuid", ""},       {"host", ""},
+    {"hostname", ""},     {"user", ""},        {"username", ""},   {"clr", ""},
+    {"highlight", ""},    {"style", ""},
 };
+
+// Unknown ones that make a date within the braces of %d.
+constexpr std::string_view kDateLetters = "YyHIMSBbjTZ";
 
 // What unknown letters print elsewhere.
 const char* hintFor(char letter) {
     switch (letter) {
         case 'F':
         case 'L':
-        case 'l':
         case 'M':
             return "; a message does not know its file, line or method";
+        case 'l':
+            return "; a message does not know its file, line or method, and milliseconds are %l "
+                   "within the braces of %d only";
         case 'x':
         case 'X':
             return "; there is no diagnostic context";
@@ -44,30 +58,51 @@ class PatternCheck {
     PatternCheck(const Piece& value, Findings& to)
         : _value(value), _pattern(value.text()), _to(to) {}
 
-    void run() {
-        const std::string_view bare = withoutQuotes(_pattern);
-        if (bare != _pattern) {
-            return tell(_to, Code::PATTERN_QUOTED, _value.place(),
-                        "the quotation marks are printed with each line", std::string(bare),
-                        _value.replacedBy(std::string(bare)));
-        }
+    // Of one that is not whole, what it lacks is not told.
+    void run(bool whole) {
+        if (_pattern.empty()) return tellEmpty();
+        if (checkQuotes()) return;
         const std::vector<PatternPart> parts = partsOf(_pattern);
-        for (const PatternPart& part : parts)
-            checkPart(part);
-        const bool message = std::any_of(parts.begin(), parts.end(), [](const PatternPart& part) {
-            return part.letter == 'm' && part.kind == PatternPart::CONVERSION && !part.isZeroWide;
-        });
-        if (message) return;
-        tell(_to, Code::PATTERN_NO_MESSAGE, _value.place(), "without %m no line shows its message",
-             _pattern.find("%M") == _pattern.npos ? "" : "%m");
+        const bool message = std::any_of(parts.begin(), parts.end(), isMessage);
+        checkDate(parts);
+        for (std::size_t i = 0; i < parts.size(); ++i) {
+            checkPart(parts[i], i + 1 < parts.size() ? &parts[i + 1] : nullptr, message);
+        }
+        const bool cut = !parts.empty() && parts.back().brace != PatternPart::kNone &&
+                         parts.back().kind == PatternPart::CUT;
+        if (whole && !message && !cut && !_messageTold) {
+            tell(_to, Code::PATTERN_NO_MESSAGE, _value.place(),
+                 "without %m no line shows its message");
+        }
     }
 
   private:
+    static bool isMessage(const PatternPart& part) {
+        return part.letter == 'm' && part.kind == PatternPart::CONVERSION && !part.isZeroWide;
+    }
+
+    void tellEmpty() {
+        tell(_to, Code::PATTERN_NO_MESSAGE, _value.place(),
+             "the pattern is empty: nothing is written");
+    }
+
+    bool checkQuotes() {
+        const std::string_view around = withoutQuotes(_pattern);
+        const bool lone = around == _pattern;
+        const std::string bare(lone ? withoutLoneQuote(_pattern) : around);
+        if (bare == _pattern) return false;
+        tell(_to, Code::PATTERN_QUOTED, _value.place(),
+             std::string(lone ? "the quotation mark is" : "the quotation marks are") +
+                 " printed with each line",
+             bare, _value.replacedBy(bare));
+        return true;
+    }
+
     Piece piece(const PatternPart& part) const {
         return _value.part(part.begin, part.end - part.begin);
     }
 
-    void checkPart(const PatternPart& part) {
+    void checkPart(const PatternPart& part, const PatternPart* next, bool message) {
         if (part.kind == PatternPart::TEXT) return checkBackslashes(part);
         if (part.kind == PatternPart::CUT) {
             const bool brace = part.brace != PatternPart::kNone;
@@ -77,8 +112,11 @@ class PatternCheck {
                         brace ? std::string(part.in(_pattern)) + '}' : "");
         }
         if (part.kind != PatternPart::CONVERSION || checkWord(part)) return;
-        if (kConversionLetters.find(part.letter) == kConversionLetters.npos) {
-            checkUnknown(part);
+        if (next != nullptr) checkSecondArgument(part, *next);
+        if (part.letter == ' ' && next != nullptr && isBlankBefore(*next)) {
+            tellBlank(part);
+        } else if (kConversionLetters.find(part.letter) == kConversionLetters.npos) {
+            if (!isOfDate(part)) checkUnknown(part, message);
         } else if (part.brace == PatternPart::kNone) {
             return;
         } else if (part.letter == 'd') {
@@ -95,14 +133,50 @@ class PatternCheck {
         }
     }
 
+    // "%d{ISO8601}{UTC}": the second one is text.
+    void checkSecondArgument(const PatternPart& part, const PatternPart& next) {
+        const std::string_view text = next.in(_pattern);
+        const std::size_t close = text.find('}');
+        const bool second = part.brace != PatternPart::kNone && next.kind == PatternPart::TEXT &&
+                            text.front() == '{' && close != text.npos;
+        if (!second) return;
+        const Piece argument = _value.part(next.begin, close + 1);
+        tell(_to, Code::PATTERN_ARGUMENT, argument.place(),
+             quoted(argument.text()) + " is printed as it stands: a conversion takes one argument" +
+                 (part.letter == 'd' ? ", and dates are those of the local time" : ""),
+             std::string(part.in(_pattern)), argument.replacedBy(""));
+    }
+
+    // "% m".
+    bool isBlankBefore(const PatternPart& next) const {
+        if (next.kind != PatternPart::TEXT) return false;
+        const std::string_view text = next.in(_pattern);
+        const bool word = text.size() > 1 && isLetter(text[1]);
+        return !word && kConversionLetters.find(text.front()) != kConversionLetters.npos;
+    }
+
+    void tellBlank(const PatternPart& part) {
+        const Piece conversion = piece(part);
+        const char letter = _pattern[part.end];
+        _messageTold = _messageTold || letter == 'm';
+        tell(_to, Code::PATTERN_UNKNOWN, conversion.place(),
+             "there is no conversion " + quoted(conversion.text()) +
+                 ": it prints nothing, and the letter behind it is text",
+             std::string(conversion.text().substr(0, conversion.size() - 1)) + letter,
+             conversion.part(conversion.size() - 1, 1).replacedBy(""));
+    }
+
     // "%msg" and the like; false: it is none of them.
     bool checkWord(const PatternPart& part) {
         std::size_t end = part.letterAt;
         while (end < _pattern.size() && isLetter(_pattern[end]))
             ++end;
         const std::string_view word = _pattern.substr(part.letterAt, end - part.letterAt);
+        if (word.size() < 2) return false;
+        const std::string low = lowered(word);
         for (const auto& [name, letter] : kWords) {
-            if (word != name) continue;
+            if (low != name) continue;
+            _messageTold = _messageTold || letter == "m";
             const bool known = kConversionLetters.find(part.letter) != kConversionLetters.npos;
             const Piece whole = _value.part(part.letterAt, word.size());
             tell(_to, Code::PATTERN_WORD, piece(part).place(),
@@ -116,13 +190,39 @@ class PatternCheck {
         return false;
     }
 
-    void checkUnknown(const PatternPart& part) {
-        const std::string meant = meantLetter(part.letter);
+    // "%Y-%m-%d %H:%M" without the "%d{" and the "}" around it is told once.
+    void checkDate(const std::vector<PatternPart>& parts) {
+        const auto isAmong = [](const PatternPart& part, std::string_view letters) {
+            return part.kind == PatternPart::CONVERSION &&
+                   letters.find(part.letter) != letters.npos;
+        };
+        const auto count = std::count_if(parts.begin(), parts.end(), [&](const PatternPart& part) {
+            return isAmong(part, kDateLetters);
+        });
+        const auto first = std::find_if(parts.begin(), parts.end(), [&](const PatternPart& part) {
+            return isAmong(part, "YyHIS");
+        });
+        if (count < 2 || first == parts.end()) return;
+        _date = true;
+        tell(_to, Code::PATTERN_UNKNOWN, piece(*first).place(),
+             "there is no conversion " + quoted(first->in(_pattern)) +
+                 ": it prints nothing; what is a date's stands in %d{...}");
+    }
+
+    bool isOfDate(const PatternPart& part) const {
+        return _date && kDateLetters.find(part.letter) != kDateLetters.npos;
+    }
+
+    // Without a message, "%M" is its capital letter and no method.
+    void checkUnknown(const PatternPart& part, bool message) {
+        const bool capital = part.letter == 'M' && !message;
+        _messageTold = _messageTold || capital;
+        const std::string meant = capital ? "m" : meantLetter(part.letter);
         const bool sure = !meant.empty() && part.letter != 'C';
         const Piece letter = _value.part(part.letterAt, 1);
         tell(_to, Code::PATTERN_UNKNOWN, piece(part).place(),
              "there is no conversion " + quoted(part.in(_pattern)) + ": it prints nothing" +
-                 hintFor(part.letter),
+                 (capital ? "" : hintFor(part.letter)),
              meant.empty() ? "" : '%' + meant,
              sure ? letter.replacedBy(meant) : std::vector<Edit>());
     }
@@ -152,6 +252,8 @@ class PatternCheck {
     const Piece _value;
     const std::string_view _pattern;
     Findings& _to;
+    bool _messageTold = false;
+    bool _date = false;  // conversions of a date are told already
 };
 
 }  // namespace
@@ -161,6 +263,12 @@ void findInPatterns(const Reading& reading, Findings& to) {
         const ConfigStatement* const said = lastOf(*appender, "layout.ConversionPattern");
         if (said == nullptr) continue;
         const Piece value = valueOf(reading.source, *said);
-        if (value.size() > 0) PatternCheck(value, to).run();
+        const std::size_t hash = hashInPattern(reading.source, *said);
+        if (hash != Source::kNone) {
+            tell(to, Code::PATTERN_HASH, reading.source.placeOf(hash),
+                 "a comment begins at the \"#\", wherever it stands: the pattern ends before it");
+        }
+        PatternCheck(value, to).run(hash == Source::kNone &&
+                                    !isCutByComment(reading.source, value.line()));
     }
 }

@@ -1,6 +1,7 @@
 #include "Text.h"
 #include "findings/Attributes.h"
 #include "findings/Findings.h"
+#include "findings/PatternEnd.h"
 
 namespace {
 
@@ -17,6 +18,10 @@ void checkTail(const Reading& reading, const ConfigStatement& said, Findings& to
     const bool blank = last == ' ' || last == '\t';
     if (!blank && last != '#') return;
     const Piece value = valueOf(reading.source, said);
+    if (isCutByComment(reading.source, value.line())) return;
+    if (said.attribute == "layout.ConversionPattern" &&
+        hashInPattern(reading.source, said) != Source::kNone)
+        return;
     const Piece tail = value.part(value.size() - 1, 1);
     const bool sure = isSurelyUnwanted(said, last);
     const std::string meant(sure ? value.text().substr(0, value.size() - 1) : "");

@@ -60,7 +60,7 @@ const std::vector<Command>& commands() {
         {"diff", "FILE", "what differs in another record file", "long", 1, 1, false, runDiff},
         {"stats", "[PREFIX]", "how large keys and values are", "key-escaped", 0, 1, false,
          runStats},
-        {"salvage", "", "what is whole in a damaged file", "output any-version", 0, 0, true,
+        {"salvage", "", "what is whole in a damaged file", "output any-version", 0, 0, false,
          runSalvage},
         {"help", "[VERB]", "show this text, or a verb's", "", 0, 1, false, runHelp}};
     return kCommands;
@@ -76,24 +76,27 @@ const Command* commandOf(const std::string& verb) {
     return nullptr;
 }
 
+const Command& knownCommand(const std::string& verb) {
+    const Command* const command = commandOf(verb);
+    if (command != nullptr) return *command;
+    const std::string meant = suggestion(verb);
+    throw Failure(USAGE,
+                  escaped(verb) + ": unknown verb" + (meant.empty() ? "; see --help" : meant));
+}
+
 const Command& findCommand(const Options& options) {
     if (options.words.empty()) throw Failure(USAGE, "no verb; see --help");
     const std::string& verb = options.words.front();
-    const Command* const command = commandOf(verb);
-    if (command == nullptr) {
-        const std::string meant = suggestion(verb);
-        throw Failure(USAGE,
-                      escaped(verb) + ": unknown verb" + (meant.empty() ? "; see --help" : meant));
-    }
+    const Command& command = knownCommand(verb);
     for (const std::string& option : options.given) {
-        if (takes(*command, option)) continue;
+        if (takes(command, option)) continue;
         throw Failure(USAGE, verb + " takes no --" + option + "; see " + verb + " --help");
     }
     const std::size_t count = options.words.size() - 1;
-    if (count < command->minArguments || count > command->maxArguments) {
+    if (count < command.minArguments || count > command.maxArguments) {
         throw Failure(USAGE, verb + ": wrong number of arguments; see " + verb + " --help");
     }
-    return *command;
+    return command;
 }
 
 std::string keyOf(const std::string& argument, const Options& options) {

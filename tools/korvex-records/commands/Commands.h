@@ -14,7 +14,7 @@ struct Command {
     const char* options;    // those it takes, by their long names; all take what kForAll says
     std::size_t minArguments;
     std::size_t maxArguments;
-    bool writes;
+    bool writes;  // the record file
     Status (*run)(const Options& options, const std::vector<std::string>& arguments);
 };
 
@@ -25,8 +25,10 @@ bool takes(const Command& command, const std::string& option);
 
 // The verb's command; null when there is none of that name.
 const Command* commandOf(const std::string& verb);
-// The same; throws Failure USAGE for an unknown verb, an option that it does not take, or a wrong
-// number of arguments.
+// The same; throws Failure USAGE when there is none, with what was surely meant.
+const Command& knownCommand(const std::string& verb);
+// The command line's; throws Failure USAGE for an unknown verb, an option that it does not take, or
+// a wrong number of arguments.
 const Command& findCommand(const Options& options);
 
 // The text that --help shows, and that of one verb.

@@ -50,12 +50,6 @@ std::string helpText(const Command& command) {
 }
 
 Status runHelp(const Options&, const std::vector<std::string>& arguments) {
-    if (arguments.empty()) {
-        write(helpText());
-        return DONE;
-    }
-    const Command* const command = commandOf(arguments.front());
-    if (command == nullptr) throw Failure(USAGE, arguments.front() + ": unknown verb; see --help");
-    write(helpText(*command));
+    write(arguments.empty() ? helpText() : helpText(knownCommand(arguments.front())));
     return DONE;
 }

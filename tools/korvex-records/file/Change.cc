@@ -95,7 +95,9 @@ bool attempt(const Pathname& name, const Options& options, const Change& change,
     if (isThere(name)) return changeFile(name, options, change, patience);
     if (!change.mayCreate) throw Failure(IO_ERROR, name + ": no such file");
     RecordMemory memory;
-    return !change.make(memory, nullptr) || options.dryRun || create(name, memory);
+    if (!change.make(memory, nullptr) || options.dryRun) return true;
+    makeRecordDirectory(options);
+    return create(name, memory);
 }
 
 }  // namespace

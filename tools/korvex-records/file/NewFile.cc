@@ -11,20 +11,16 @@
 #include "file/NewFileName.h"
 #include "terminal/Progress.h"
 
-namespace {
+Pathname directoryOf(const Pathname& file) {
+    const Pathname parent = file.toParent();
+    return parent.empty() ? Pathname::cur : parent;
+}
 
 // Not every file system can, and not every directory that may be written to may be opened.
 void syncDirectory(const Pathname& directory) {
     const ScopedFileDescriptor fd(directory);
     if (!fd.valid() || fd.sync() == 0 || errno == EINVAL || errno == ENOTSUP) return;
     throw Failure(IO_ERROR, withErrno("saved, but cannot sync " + directory));
-}
-
-}  // namespace
-
-Pathname directoryOf(const Pathname& file) {
-    const Pathname parent = file.toParent();
-    return parent.empty() ? Pathname::cur : parent;
 }
 
 NewFile::NewFile(const Pathname& directory) : _directory(directory) {

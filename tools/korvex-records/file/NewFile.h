@@ -44,3 +44,7 @@ void sweep(const Pathname& directory, const OpenFile* recordFile);
 
 // The directory that the file is in.
 Pathname directoryOf(const Pathname& file);
+
+// Brings what was made or renamed in the directory to the disk, where the file system can. Throws
+// Failure IO_ERROR.
+void syncDirectory(const Pathname& directory);

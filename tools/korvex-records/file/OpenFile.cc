@@ -44,7 +44,9 @@ bool OpenFile::isStillNamed() const {
 }
 
 bool OpenFile::isUntouched() const {
+    // The time of the last change of the file's state, since a new mode, access control list or
+    // hard link must not be lost either. Writing sets it too.
     struct stat st {};
     return isStillNamed() && _fd.stat(&st) && st.st_size == _stat.st_size &&
-           st.st_mtim.tv_sec == _stat.st_mtim.tv_sec && st.st_mtim.tv_nsec == _stat.st_mtim.tv_nsec;
+           st.st_ctim.tv_sec == _stat.st_ctim.tv_sec && st.st_ctim.tv_nsec == _stat.st_ctim.tv_nsec;
 }

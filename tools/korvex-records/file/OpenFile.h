@@ -28,7 +28,8 @@ class OpenFile {
     void refresh();
     // Whether the name means this file.
     bool isStillNamed() const;
-    // The same, and nobody has written to the file since it was looked at.
+    // The same, and nobody has written to the file, nor changed its owner, mode, attributes or
+    // links, since it was looked at.
     bool isUntouched() const;
     // Begins at the start of the file, and must not outlive this object.
     StrictReader reader() const;
@@ -39,6 +40,7 @@ class OpenFile {
     struct stat _stat {};
 };
 
-// Whether there is a file of that name. A symbolic link to nothing is no missing file, since what
-// it means may only not be mounted: throws Failure IO_ERROR, as for what cannot be looked at.
+// Whether there is a file or directory of that name. A symbolic link to nothing is no missing file,
+// since what it means may only not be mounted: throws Failure IO_ERROR, as for what cannot be
+// looked at.
 bool isThere(const Pathname& name);

@@ -2,7 +2,11 @@
 
 #include <korvex/util/LoaderInfo.h>
 
+#include <cerrno>
+
 #include "Status.h"
+#include "file/NewFile.h"
+#include "file/OpenFile.h"
 
 namespace {
 
@@ -28,13 +32,22 @@ Pathname recordFilePath(const Options& options) {
     const std::string complaint = unusableDb(db);
     if (!complaint.empty()) throw Failure(USAGE, complaint);
     const Pathname directory = db / "hashDb";
-    if (options.create && !directory.exists() && !directory.mkdir(Pathname::MKDIR_PRIVATE)) {
-        throw Failure(IO_ERROR, withErrno("cannot make " + directory));
-    }
-    if (!directory.exists()) {
+    if (!isThere(directory) && !options.create) {
         throw Failure(IO_ERROR, directory +
                                     ": no such directory; put, load and batch make it with "
                                     "--create");
     }
     return directory / "data";
+}
+
+// Not before there is something to put there: what is refused leaves no trace.
+void makeRecordDirectory(const Options& options) {
+    if (!options.create || options.file) return;
+    const Pathname directory = directoryOf(recordFilePath(options));
+    if (isThere(directory)) return;
+    // Another run may make it at the same time.
+    if (!directory.mkdir(Pathname::MKDIR_PRIVATE) && errno != EEXIST) {
+        throw Failure(IO_ERROR, withErrno("cannot make " + directory));
+    }
+    syncDirectory(directoryOf(directory));
 }

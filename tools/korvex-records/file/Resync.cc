@@ -4,6 +4,7 @@
 #include <optional>
 #include <string>
 #include <unordered_set>
+#include <vector>
 
 #include "text/Utf8.h"
 
@@ -28,7 +29,7 @@ using Key = std::optional<std::string>;  // none: any key may come next
 
 class Search {
   public:
-    Search(FileWindow& file, std::uint64_t at, const std::vector<RecordFrame>& before)
+    Search(FileWindow& file, std::uint64_t at, const std::deque<RecordFrame>& before)
         : _file(file), _at(at), _before(before) {
         if (!before.empty()) _lastKey = orderOf(before.back());
     }
@@ -124,11 +125,16 @@ class Search {
     }
 
     // The record at the fault has a key that no record may have, and nothing else is wrong with it.
+    // Or a damaged length made that key and leads from it to a value: then records follow on from
+    // the next length, too, or do not reach the end.
     std::optional<std::uint64_t> endOfRefused() const {
         RecordFrame frame;
         if (!readFrame(_file, _at, frame).empty()) return std::nullopt;
-        const bool goesOn = frame.end() == _file.size() || followOn(frame.end(), _lastKey, kEnough);
-        return goesOn ? std::optional<std::uint64_t>(frame.end()) : std::nullopt;
+        const std::uint64_t end = frame.end();
+        const bool goesOn = end == _file.size() || leadsToEnd(end, _lastKey) ||
+                            (followOn(end, _lastKey, kEnough) &&
+                             !followOn(end + 4 + _file.numberAt(end), _lastKey, kEnough));
+        return goesOn ? std::optional<std::uint64_t>(end) : std::nullopt;
     }
 
     // A length that grew: the next record begins within what was read before.
@@ -236,7 +242,7 @@ class Search {
 
     FileWindow& _file;
     const std::uint64_t _at;
-    const std::vector<RecordFrame>& _before;
+    const std::deque<RecordFrame>& _before;
     Key _lastKey;
     // From these places records follow on each other, but not far enough. Without them a file whose
     // values are in order, as its keys are, would be walked through from each of its values.
@@ -246,6 +252,6 @@ class Search {
 
 }  // namespace
 
-Resync resync(FileWindow& file, std::uint64_t at, const std::vector<RecordFrame>& before) {
+Resync resync(FileWindow& file, std::uint64_t at, const std::deque<RecordFrame>& before) {
     return Search(file, at, before).run();
 }

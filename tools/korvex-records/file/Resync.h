@@ -1,7 +1,7 @@
 #pragma once
 
 #include <cstdint>
-#include <vector>
+#include <deque>
 
 #include "file/FileWindow.h"
 #include "file/RecordFrame.h"
@@ -22,4 +22,4 @@ struct Resync {
 // has left its trace: of a record with one damaged length the other one still tells where the next
 // record begins. By such a trace a place is also found in what was read before the fault: a damaged
 // length may have led into the middle of things.
-Resync resync(FileWindow& file, std::uint64_t at, const std::vector<RecordFrame>& before);
+Resync resync(FileWindow& file, std::uint64_t at, const std::deque<RecordFrame>& before);

@@ -1,6 +1,7 @@
 #include "file/Salvage.h"
 
-#include <vector>
+#include <deque>
+#include <memory>
 
 #include "file/FileWindow.h"
 #include "file/KeyHistory.h"
@@ -24,6 +25,7 @@ class Salvager {
             if (!fault.empty()) passGap(fault);
             progressAt(_at);
         }
+        _keys.reset();  // before whoever takes the records needs memory for them
         handOn(_read.size());
     }
 
@@ -37,7 +39,7 @@ class Salvager {
             return "key \"" + escaped(key) + "\" is taken for the version";
         }
         if (key.find('\0') != key.npos) return "key \"" + escaped(key) + "\" holds a NUL";
-        if (!_keys.add(key)) return "key \"" + escaped(key) + "\" stands twice";
+        if (!_keys->add(key)) return "key \"" + escaped(key) + "\" stands twice";
         _read.push_back(frame);
         _at = frame.end();
         return "";
@@ -48,8 +50,9 @@ class Salvager {
     }
 
     void handOn(std::size_t count) {
-        for (std::size_t i = 0; i < count; ++i) {
-            const RecordFrame& frame = _read[i];
+        for (; count > 0; --count) {
+            const RecordFrame frame = _read.front();
+            _read.pop_front();
             const std::string key(_file.at(frame.keyAt(), frame.keySize));
             if (isVersion(frame, key)) continue;
             _to.take(frame, key, _file.at(frame.valueAt(), frame.valueSize));
@@ -78,10 +81,10 @@ class Salvager {
     FileWindow _file;
     FileWindow _probe;
     std::uint64_t _at = 0;
-    KeyHistory _keys;
+    std::unique_ptr<KeyHistory> _keys = std::make_unique<KeyHistory>();
     // Since the last gap. They are handed on behind the next one only, because that may make them
     // doubtful.
-    std::vector<RecordFrame> _read;
+    std::deque<RecordFrame> _read;
 };
 
 }  // namespace

@@ -41,21 +41,15 @@ bool StrictReader::accept() {
     return false;
 }
 
-// While the keys ascend, the last one is enough. If they do not, all are looked at again.
 bool StrictReader::isNew() {
-    if (_history) return _history->add(_key);
-    if (_found.records == 0 || _key > _last) {
-        _last = _key;
-        return true;
-    }
-    _history = std::make_unique<KeyHistory>();
-    FileWindow before(_fd, _file.size(), _file.name());
-    RecordFrame frame;
-    for (std::uint64_t at = 0; at < _frame.begin; at = frame.end()) {
-        readFrame(before, at, frame);
-        _history->add(before.at(frame.keyAt(), frame.keySize));
-    }
-    return _history->add(_key);
+    return _keys.add(_key, [this](const KeysSoFar::Take& take) {
+        FileWindow before(_fd, _file.size(), _file.name());
+        RecordFrame frame;
+        for (std::uint64_t at = 0; at < _frame.begin; at = frame.end()) {
+            readFrame(before, at, frame);
+            take(before.at(frame.keyAt(), frame.keySize));
+        }
+    });
 }
 
 Status unlessDamaged(const StrictReader& reader, Status status) {

@@ -1,13 +1,12 @@
 #pragma once
 
 #include <cstdint>
-#include <memory>
 #include <string>
 #include <string_view>
 
 #include "Status.h"
 #include "file/FileWindow.h"
-#include "file/KeyHistory.h"
+#include "file/KeysSoFar.h"
 #include "file/RecordFrame.h"
 
 // What a strict look at a record file found. Stricter than loading, which keeps what it can: here a
@@ -49,8 +48,7 @@ class StrictReader {
     std::uint64_t _at = 0;
     RecordFrame _frame;
     std::string _key;
-    std::string _last;                     // the former record's key
-    std::unique_ptr<KeyHistory> _history;  // of a file whose keys do not ascend
+    KeysSoFar _keys;
     Scan _found;
 };
 

@@ -20,8 +20,7 @@ bool isPrintableAscii(unsigned c) {
 
 // A control character could move the cursor or program the keyboard.
 bool isShownAsText(char32_t c) {
-    if (c == '\t' || c == '\n') return true;
-    return c >= ' ' && (c < 0x7F || c > 0x9F);
+    return c == '\t' || c == '\n' || !isControl(c);
 }
 
 std::string dumpedLine(std::size_t offset, std::string_view bytes) {

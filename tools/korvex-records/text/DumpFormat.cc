@@ -1,7 +1,7 @@
 #include "text/DumpFormat.h"
 
 #include "Status.h"
-#include "file/KeyHistory.h"
+#include "file/KeysSoFar.h"
 #include "file/RecordFrame.h"
 #include "text/Escape.h"
 
@@ -21,6 +21,18 @@ class DumpParser {
     }
 
   private:
+    // The keys of the first so many records, which are known to be fine, and leaves the input
+    // behind the next one's.
+    void parseAgain(std::uint64_t count) {
+        _in.rewind();
+        parseHeader();
+        for (std::uint64_t i = 0; i < count; ++i) {
+            nextLine();
+            parseRecord();
+        }
+        nextLine();
+    }
+
     [[noreturn]] void fail(const std::string& what) const {
         throw Failure(USAGE, "dump, line " + std::to_string(_in.number()) + ": " + what);
     }
@@ -61,7 +73,12 @@ class DumpParser {
         if (isRefusedKey(_key)) {
             fail("refused key \"" + escaped(_key) + "\": it would not survive a reload");
         }
-        if (!_history.add(_key)) {
+        const auto again = [this](const KeysSoFar::Take& take) {
+            DumpParser(_in, [&take](const std::string& key, const std::string&) {
+                take(key);
+            }).parseAgain(_keys.count());
+        };
+        if (!_keys.add(_key, again)) {
             fail("key \"" + escaped(_key) + "\" comes twice" +
                  (_duplicates ? ", as duplicates=1 says; a record file holds a key once" : ""));
         }
@@ -90,7 +107,7 @@ class DumpParser {
 
     LineInput& _in;
     const DumpedRecordTaker& _take;
-    KeyHistory _history;
+    KeysSoFar _keys;
     std::string _line;
     std::string _key;
     std::string _value;

@@ -1,5 +1,9 @@
 #include "text/Escape.h"
 
+#include <algorithm>
+
+#include "text/Utf8.h"
+
 namespace {
 
 void appendHexOf(std::string& out, char c) {
@@ -55,6 +59,24 @@ void appendEscaped(std::string& out, std::string_view bytes, std::string_view ba
             appendHexOf(out, c);
         }
     }
+}
+
+std::string withoutControls(std::string_view text) {
+    std::string out;
+    while (!text.empty()) {
+        char32_t character = 0;
+        const std::size_t length = std::max<std::size_t>(1, utf8Character(text, character));
+        for (const char c : text.substr(0, length)) {
+            if (!isControl(character)) {
+                out += c;
+            } else {
+                out += '\\';
+                appendHexOf(out, c);
+            }
+        }
+        text.remove_prefix(length);
+    }
+    return out;
 }
 
 bool appendUnescaped(std::string& out, std::string_view text) {

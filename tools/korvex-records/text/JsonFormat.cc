@@ -3,7 +3,7 @@
 #include <optional>
 
 #include "Status.h"
-#include "file/KeyHistory.h"
+#include "file/KeysSoFar.h"
 #include "file/RecordFrame.h"
 #include "text/Base64.h"
 #include "text/Escape.h"
@@ -91,6 +91,19 @@ class LineParser {
     std::optional<std::string> _value;
 };
 
+// The keys of the first so many lines, which are known to be fine; leaves the input behind the
+// next.
+void parseAgain(LineInput& in, std::uint64_t count, const KeysSoFar::Take& take) {
+    std::string line;
+    std::string key;
+    std::string value;
+    in.rewind();
+    while (in.next(line) && in.number() <= count) {
+        LineParser(in.number(), line).parse(key, value);
+        take(key);
+    }
+}
+
 }  // namespace
 
 void appendJsonLine(std::string& out, std::string_view key, std::string_view value) {
@@ -108,7 +121,8 @@ std::string jsonDamage(const std::string& damage) {
 }
 
 void parseJson(LineInput& in, const DumpedRecordTaker& take) {
-    KeyHistory history;
+    KeysSoFar keys;
+    const auto again = [&](const KeysSoFar::Take& former) { parseAgain(in, keys.count(), former); };
     std::string line;
     std::string key;
     std::string value;
@@ -120,7 +134,7 @@ void parseJson(LineInput& in, const DumpedRecordTaker& take) {
         if (isRefusedKey(key)) {
             parser.fail("refused key \"" + escaped(key) + "\": it would not survive a reload");
         }
-        if (!history.add(key)) parser.fail("key \"" + escaped(key) + "\" comes twice");
+        if (!keys.add(key, again)) parser.fail("key \"" + escaped(key) + "\" comes twice");
         take(key, value);
     }
 }

@@ -59,19 +59,23 @@ const char* readEscape(std::string_view& rest, std::string& out) {
 
 void appendJsonString(std::string& out, std::string_view text) {
     out += '"';
-    for (const char c : text) {
-        if (c == '"' || c == '\\') {
+    while (!text.empty()) {
+        char32_t character = 0;
+        const std::size_t length = utf8Character(text, character);
+        if (character == '"' || character == '\\') {
             out += '\\';
-            out += c;
-        } else if (c == '\n') {
+            out += text[0];
+        } else if (character == '\n') {
             out += "\\n";
-        } else if (c == '\t') {
+        } else if (character == '\t') {
             out += "\\t";
-        } else if (static_cast<unsigned char>(c) < ' ' || c == '\x7f') {
-            out += "\\u00" + toHex({&c, 1});
+        } else if (isControl(character)) {
+            const char last = static_cast<char>(character);
+            out += "\\u00" + toHex({&last, 1});
         } else {
-            out += c;
+            out += text.substr(0, length);
         }
+        text.remove_prefix(length);
     }
     out += '"';
 }

@@ -45,6 +45,10 @@ bool isUtf8(std::string_view bytes) {
     return true;
 }
 
+bool isControl(char32_t character) {
+    return character < ' ' || (character >= 0x7F && character <= 0x9F);
+}
+
 void appendUtf8(std::string& out, char32_t character) {
     const auto piece = [&out, character](unsigned shift, unsigned mark, unsigned mask) {
         out += static_cast<char>(mark | (character >> shift & mask));
