@@ -1,11 +1,12 @@
 #!/usr/bin/env python3
 """Copies a store's records into etcd, Redis or PostgreSQL, and back, with their own clients.
 
-    records.py push|pull etcd|redis|postgresql [PREFIX]
+    records.py push|pull|watch etcd|redis|postgresql [PREFIX]
 
 push makes the server hold what the store holds below PREFIX: changed records are put, records that
-are gone are deleted, others are left alone. pull makes the store hold what the server holds there;
-no program that keeps the store in its memory may run then, for it would write it all back.
+are gone are deleted, others are left alone. watch pushes now and each time the store was saved, until
+it is ended. pull makes the store hold what the server holds there; no program that keeps the store in
+its memory may run then, for it would write it all back.
 
 Keys and values may be of any bytes. The store is that of KORVEX_DB; etcdctl, redis-cli and psql find
 their servers as they always do (ETCDCTL_ENDPOINTS, REDISCLI_AUTH and -p, PGHOST ...), and REDIS_CLI
@@ -19,6 +20,7 @@ import re
 import shlex
 import subprocess
 import sys
+import time
 
 
 def run(command, stdin=b""):
@@ -29,8 +31,34 @@ def tool(variable, default):
     return shlex.split(os.environ.get(variable, default))
 
 
+class Failure(Exception):
+    pass
+
+
 class Store:
     tool = tool("KORVEX_RECORDS", "korvex-records")
+
+    def stamp(self):
+        """Changes with each save."""
+        try:
+            found = os.stat(os.path.join(os.environ["KORVEX_DB"], "hashDb/data"))
+        except FileNotFoundError:
+            return None
+        return found.st_ino, found.st_size, found.st_mtime_ns
+
+    def saved(self, prefix):
+        """What was saved last. A save may rewrite the file in place, and half of a file would delete
+        the rest: so nobody must have written to it for a second, and an empty file is none."""
+        while True:
+            before = self.stamp()
+            if before is None or before[1] == 0:
+                raise Failure("there is no record file, so nothing is changed")
+            if time.time_ns() - before[2] < 1000000000:
+                time.sleep(0.1)
+                continue
+            records = self.read(prefix)
+            if self.stamp() == before:
+                return records
 
     def read(self, prefix):
         def part(record, name):
@@ -51,7 +79,8 @@ class Store:
 
 
 class Etcd:
-    """A key for each record. A value may have 1.5 MB, all of them 2 GB, as etcd is set up."""
+    """A key for each record. A value may have 1.5 MB, all of them 2 GB, as etcd is set up. What has
+    changed is put in transactions of at most 100 changes and some 500 KB, below etcd's limits."""
     tool = tool("ETCDCTL", "etcdctl")
     root = b"korvex/"
 
@@ -60,12 +89,28 @@ class Etcd:
         return {base64.b64decode(one["key"])[len(self.root):]: base64.b64decode(one.get("value", ""))
                 for one in found.get("kvs", [])}
 
+    @staticmethod
+    def quoted(data):
+        return '"' + "".join("\\x%02x" % byte for byte in data) + '"'
+
     def change(self, put, gone):
-        for key, value in put.items():
-            empty = [] if value else [""]  # of nothing on standard input it takes no value
-            run([*self.tool, "put", "--", self.root + key, *empty], value)
-        for key in gone:
-            run([*self.tool, "del", "--", self.root + key])
+        changes = ["put -- %s %s" % (self.quoted(self.root + key), self.quoted(value))
+                   for key, value in put.items()]
+        changes += ["del -- " + self.quoted(self.root + key) for key in gone]
+        some = []
+        for change in changes:
+            if some and (len(some) == 100 or sum(map(len, some)) + len(change) > 4 * 500000):
+                self.commit(some)
+                some = []
+            some.append(change)
+        if some:
+            self.commit(some)
+
+    def commit(self, changes):
+        """Under no condition, and nothing else otherwise."""
+        out = run([*self.tool, "txn"], ("\n" + "\n".join(changes) + "\n\n\n").encode())
+        if not out.startswith(b"SUCCESS"):
+            raise Failure("etcd refused a transaction: " + out.decode(errors="replace"))
 
 
 class Redis:
@@ -136,12 +181,26 @@ SERVERS = {"etcd": Etcd, "redis": Redis, "postgresql": Postgresql}
 
 
 def push(store, server, prefix):
-    wanted = store.read(prefix)
+    wanted = store.saved(prefix)
     there = server.read(prefix)
     put = {key: value for key, value in wanted.items() if there.get(key) != value}
     gone = [key for key in there if key not in wanted]
     server.change(put, gone)
-    print("%d put, %d deleted, %d left alone" % (len(put), len(gone), len(wanted) - len(put)))
+    print("%d put, %d deleted, %d left alone" % (len(put), len(gone), len(wanted) - len(put)),
+          flush=True)
+
+
+def watch(store, server, prefix):
+    pushed = None
+    while True:
+        stamp = store.stamp()
+        if stamp != pushed:
+            try:
+                push(store, server, prefix)
+                pushed = stamp
+            except (Failure, subprocess.CalledProcessError) as error:
+                print(error, file=sys.stderr, flush=True)  # and is tried again
+        time.sleep(1)
 
 
 def pull(store, server, prefix):
@@ -153,12 +212,17 @@ def pull(store, server, prefix):
     print("%d records" % len(found))
 
 
+WORDS = {"push": push, "pull": pull, "watch": watch}
+
+
 def main():
-    if len(sys.argv) not in (3, 4) or sys.argv[1] not in ("push", "pull") \
-            or sys.argv[2] not in SERVERS:
+    if len(sys.argv) not in (3, 4) or sys.argv[1] not in WORDS or sys.argv[2] not in SERVERS:
         sys.exit(__doc__)
     prefix = os.fsencode(sys.argv[3]) if len(sys.argv) == 4 else b""
-    {"push": push, "pull": pull}[sys.argv[1]](Store(), SERVERS[sys.argv[2]](), prefix)
+    try:
+        WORDS[sys.argv[1]](Store(), SERVERS[sys.argv[2]](), prefix)
+    except (Failure, subprocess.CalledProcessError) as error:
+        sys.exit("records.py: %s" % error)
 
 
 if __name__ == "__main__":

@@ -105,16 +105,38 @@ std::string levelName(LogLevel level, const std::string& layout) {
     return layout.find("%.2p") == layout.npos ? name : name.substr(0, 2);
 }
 
+// Whether the layout cuts that conversion to two bytes.
+bool cuts(const std::string& layout, char letter) {
+    return layout.find(std::string(".2") + letter) != layout.npos;
+}
+
+// The group's text is what was logged, where the layout has such a group.
+void expectGroup(const Pcre& found, const char* name, const std::string& logged) {
+    const std::string group = found.group(name);
+    if (group != "-") {
+        EXPECT_EQ(group, logged) << name;
+    }
+}
+
+// Without the zeros that fill it up.
+std::string number(const std::string& text) {
+    const std::size_t first = text.find_first_not_of('0');
+    return first == text.npos ? text.substr(0, 1) : text.substr(first);
+}
+
 void expectFound(const Pcre& found, const Logged& logged, const std::string& layout) {
     EXPECT_EQ(found.group("message"), logged.message);
     EXPECT_EQ(found.group("level"), levelName(logged.level, layout));
-    const bool isCut = layout.find("%.2c") != layout.npos;
-    if (found.group("channel") != "-") {
-        EXPECT_EQ(found.group("channel"), isCut ? logged.channel.substr(0, 2) : logged.channel);
+    EXPECT_EQ(found.group("time"), logged.time);
+    expectGroup(found, "channel", cuts(layout, 'c') ? logged.channel.substr(0, 2) : logged.channel);
+    expectGroup(found, "thread", logged.thread);
+    EXPECT_EQ(found.group("uptime_s") == "-", layout.find('R') == layout.npos);
+    expectGroup(found, "uptime_s", logged.uptimeS);
+    EXPECT_EQ(found.group("uptime_ms") == "-", layout.find("%08r") == layout.npos);
+    if (found.group("uptime_ms") != "-") {
+        EXPECT_EQ(number(found.group("uptime_ms")), logged.uptimeMs);
     }
-    if (found.group("thread") != "-") {
-        EXPECT_EQ(found.group("thread"), logged.thread);
-    }
+    EXPECT_EQ(found.group("cpu_ticks") == "-", layout.find("%u") == layout.npos);
 }
 
 std::vector<std::string> layouts() {

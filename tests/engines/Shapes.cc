@@ -5,6 +5,7 @@
 #include <unistd.h>
 
 #include <functional>
+#include <regex>
 #include <utility>
 
 namespace testsupport {
@@ -43,32 +44,75 @@ class Runner : public Thread {
     const std::function<void()> _what;
 };
 
-void write(LogAppender& appender, const Logged& one) {
-    const Logger logger(one.channel.c_str());
-    appender.write(LogMsgMetadata(&logger, one.level), one.message);
+// A pattern of the layout's dates alone, from the first to the last, without their widths.
+std::string datesOf(const std::string& layout) {
+    static const std::regex date(R"(%[-0-9]*d((\{[^}]*\})?))");
+    std::string dates;
+    std::ptrdiff_t end = 0;
+    for (std::sregex_iterator one(layout.begin(), layout.end(), date), none; one != none; ++one) {
+        if (!dates.empty()) dates += layout.substr(end, one->position() - end);
+        dates += "%d" + one->str(1);
+        end = one->position() + one->length();
+    }
+    return dates;
 }
 
-void writeForged(LogAppender& appender, const std::string& thread, std::vector<Logged>& all) {
-    const Logger logger("net");
-    const LogMsgMetadata metadata(&logger, INFO);
-    std::string line;
-    appender.layout().apply(line, metadata, "looks like a line");
-    line.pop_back();
-    appender.write(metadata, "two lines\n" + line);
-    all.push_back({INFO, "net", thread, "two lines"});
-    all.push_back({INFO, "net", thread, "looks like a line"});
-}
+// Logs messages, and tells what was logged.
+class Recorder {
+  public:
+    explicit Recorder(LogAppender& appender)
+        : _appender(appender), _dates(datesOf(appender.layout().pattern()).c_str()) {}
+
+    void write(Logged one) {
+        const Logger logger(one.channel.c_str());
+        const LogMsgMetadata metadata(&logger, one.level);
+        _appender.write(metadata, one.message);
+        add(one, metadata);
+    }
+
+    void writeForged(const std::string& thread) {
+        const Logger logger("net");
+        const LogMsgMetadata metadata(&logger, INFO);
+        const std::string line = applied(_appender.layout(), metadata, "looks like a line");
+        _appender.write(metadata, "two lines\n" + line.substr(0, line.size() - 1));
+        add({INFO, "net", thread, "two lines", {}, {}, {}, {}}, metadata);
+        add({INFO, "net", thread, "looks like a line", {}, {}, {}, {}}, metadata);
+    }
+
+    std::vector<Logged> all;
+
+  private:
+    static std::string applied(const LogFormat& layout, const LogMsgMetadata& metadata,
+                               const std::string& message) {
+        std::string text;
+        layout.apply(text, metadata, message);
+        return text;
+    }
+    void add(Logged one, const LogMsgMetadata& metadata) {
+        one.time = applied(_dates, metadata, "");
+        one.uptimeMs = applied(_milliseconds, metadata, "");
+        one.uptimeS = applied(_seconds, metadata, "");
+        one.utc = applied(_utc, metadata, "");
+        all.push_back(std::move(one));
+    }
+
+    LogAppender& _appender;
+    const LogFormat _dates;
+    const LogFormat _milliseconds{"%r"};
+    const LogFormat _seconds{"%R"};
+    const LogFormat _utc{"%d{%Y-%m-%d %H:%M:%S.%l}"};
+};
 
 }  // namespace
 
 Logged loggedMessage(unsigned i) {
     const std::vector<std::string> texts = shapes(" #" + std::to_string(i));
     const auto level = static_cast<LogLevel>(i % 10);
-    return {level, kChannels[i % kChannels.size()], "", texts[i % texts.size()]};
+    return {level, kChannels[i % kChannels.size()], "", texts[i % texts.size()], {}, {}, {}, {}};
 }
 
 std::vector<Logged> logAll(LogAppender& appender, unsigned count, unsigned pause) {
-    std::vector<Logged> all;
+    Recorder recorder(appender);
     const unsigned share = count / static_cast<unsigned>(kThreads.size()) + 1;
     for (unsigned done = 0; done < count;) {
         const std::string& thread = kThreads[done / share];
@@ -76,9 +120,8 @@ std::vector<Logged> logAll(LogAppender& appender, unsigned count, unsigned pause
             for (unsigned n = 0; n < share && done < count; ++n, ++done) {
                 Logged one = loggedMessage(done);
                 one.thread = thread;
-                write(appender, one);
-                all.push_back(one);
-                if (done % 100 == 99) writeForged(appender, thread, all);
+                recorder.write(std::move(one));
+                if (done % 100 == 99) recorder.writeForged(thread);
                 if (done % 2000 == 1999) ::usleep(pause * 1000);
             }
         };
@@ -90,7 +133,7 @@ std::vector<Logged> logAll(LogAppender& appender, unsigned count, unsigned pause
         runner.go();
         runner.join();
     }
-    return all;
+    return recorder.all;
 }
 
 }  // namespace testsupport

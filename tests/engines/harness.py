@@ -24,7 +24,9 @@ LIBRARIES = [os.path.join(ROOT, "usr/lib", LIBRARY), os.path.join(ROOT, "lib", L
 PATH = os.pathsep.join([os.path.join(ROOT, "usr/sbin"), os.path.join(ROOT, "usr/bin"),
                         "/usr/sbin", os.environ["PATH"]])
 
-Entry = collections.namedtuple("Entry", "level channel thread message")
+Entry = collections.namedtuple("Entry", "level channel thread time uptime_ms uptime_s cpu_ticks "
+                               "utc message")
+CONVERSIONS = {"channel": "c", "thread": "t", "uptime_ms": "r", "uptime_s": "R", "cpu_ticks": "u"}
 
 
 def program(name):
@@ -44,6 +46,20 @@ def environment(**more):
 def layouts():
     with open(os.path.join(SOURCE, "tests/engines/layouts.txt")) as file:
         return file.read().splitlines()
+
+
+def shows(layout, letter):
+    """Whether the layout has that conversion, outside of its dates."""
+    return re.search("%[-.0-9]*" + letter, re.sub(r"\{[^}]*\}", "", layout)) is not None
+
+
+def entry_of(one):
+    """What an engine gave as an object of JSON. Of processor time only a number is expected."""
+    def number(field):
+        return int(one[field]) if field in one else None
+    return Entry(one["level"], one.get("channel"), one.get("thread"), one["time"],
+                 number("uptime_ms"), number("uptime_s"),
+                 None if number("cpu_ticks") is None else True, None, one["message"].encode())
 
 
 def eventually(condition, what, seconds=120):
@@ -100,7 +116,7 @@ class EngineTest(unittest.TestCase):
         for process in list(self.processes):
             self.stop(process, signal.SIGKILL)
 
-    def configure(self, layout, size=4000000, backups=20):
+    def configure(self, layout, size=COUNT * 40, backups=20):
         """A configuration with the appender LOG; its path."""
         return self.write("log.cfg", "rootCategory=DEBUG,LOG\n"
                           "appender.LOG.fileName=%s\n"
@@ -119,18 +135,21 @@ class EngineTest(unittest.TestCase):
                              capture_output=True, env=environment()).stdout
         entries = []
         for line in out.decode().splitlines():
-            level, channel, thread, message = line.split("\t")
-            entries.append(Entry(level, channel, thread, bytes.fromhex(message)))
+            level, channel, thread, when, uptime_ms, uptime_s, utc, message = line.split("\t")
+            entries.append(Entry(level, channel, thread, when, int(uptime_ms), int(uptime_s), True,
+                                 utc, bytes.fromhex(message)))
         self.assertGreater(len(entries), count)
         return entries
 
     def shown(self, entries, layout):
         """The entries as far as the layout shows them."""
-        has_channel = re.search(r"%[-.0-9]*c", layout)
-        has_thread = re.search(r"%[-.0-9]*t", layout)
-        return [Entry(entry.level[:2] if "%.2p" in layout else entry.level,
-                      has_channel and (entry.channel[:2] if "%.2c" in layout else entry.channel),
-                      has_thread and entry.thread, entry.message) for entry in entries]
+        hidden = {field: None for field, letter in CONVERSIONS.items() if not shows(layout, letter)}
+        hidden["utc"] = None
+        cut = {field: slice(2 if ".2" + letter in layout else None)
+               for field, letter in (("level", "p"), ("channel", "c"))}
+        return [one._replace(**{"level": one.level[cut["level"]],
+                                "channel": one.channel[cut["channel"]], **hidden})
+                for one in entries]
 
     def last_of_backups(self):
         """The numbers of the messages that are the last of a file that was rotated away, of the first

@@ -6,7 +6,7 @@ import os
 import subprocess
 import unittest
 
-from harness import COUNT, SOURCE, EngineTest, Entry, environment, layouts, program
+from harness import COUNT, SOURCE, EngineTest, entry_of, environment, layouts, program
 
 MODULES = os.path.join(os.path.dirname(os.environ["KORVEX_ENGINES"]), "npm")
 SCRIPT = os.path.join(SOURCE, "tests/engines/expressions.cjs")
@@ -32,8 +32,7 @@ class ExpressionsTest(EngineTest):
                                      env=environment())
                 self.assertEqual((out.returncode, out.stderr.decode()[-500:]), (0, ""))
                 found = [json.loads(line) for line in out.stdout.split(b"\n")[:-1]]
-                self.assert_same([Entry(one["level"], one.get("channel"), one.get("thread"),
-                                        one["message"].encode()) for one in found], expected)
+                self.assert_same([entry_of(one) for one in found], expected)
 
     def test_fluent_bit(self):
         self.check("fluent-bit")

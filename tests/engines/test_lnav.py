@@ -4,6 +4,7 @@ import collections
 import csv
 import io
 import os
+import re
 import subprocess
 import unittest
 
@@ -44,9 +45,10 @@ class LnavTest(EngineTest):
             with self.subTest(layout):
                 self.remove_logs()
                 self.install(layout)
-                expected = self.shown(self.log(), layout)
+                logged = self.log()
+                expected = self.shown(logged, layout)
                 self.check_counts(expected)
-                self.check_messages(expected)
+                self.check_messages(expected, [one.utc for one in logged])
 
     def remove_logs(self):
         for name in os.listdir(self.directory):
@@ -60,13 +62,23 @@ class LnavTest(EngineTest):
         self.assertEqual({(row[0], row[1]): int(row[2]) for row in found}, counts)
 
     # Lines of one millisecond are in order within a file; of two files lnav may mix them.
-    def check_messages(self, expected):
-        thread = "thread" if expected[0].thread else "''"
-        rows = self.query("SELECT level, %s, hex(log_body), log_path FROM korvex_log "
-                          "ORDER BY log_line" % thread)
-        oldest_first = sorted(rows, key=lambda row: -backup_number(row[3]))
-        self.assert_same([(row[0], row[1], bytes.fromhex(row[2])) for row in oldest_first],
-                         [(one.level, one.thread or "", one.message) for one in expected])
+    def check_messages(self, expected, instants):
+        fields = [field for field in ("channel", "thread", "uptime_ms", "uptime_s")
+                  if getattr(expected[0], field) is not None]
+        rows = self.query("SELECT %s, log_time, hex(log_body), log_path FROM korvex_log "
+                          "ORDER BY log_line" % ", ".join(["level", *fields]))
+        oldest_first = sorted(rows, key=lambda row: -backup_number(row[-1]))
+        if re.search(r"[,.][0-9]{3}", expected[0].time) is None:  # the layout has no milliseconds
+            instants = [one[:-3] + "000" for one in instants]
+        self.assert_same(
+            [(*(value(field, text) for field, text in zip(fields, row[1:])), row[0], row[-3],
+              bytes.fromhex(row[-2])) for row in oldest_first],
+            [(*(getattr(one, field) for field in fields), one.level, instant, one.message)
+             for one, instant in zip(expected, instants)])
+
+
+def value(field, text):
+    return int(text) if field.startswith("uptime") else text
 
 
 def backup_number(path):

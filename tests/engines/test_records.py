@@ -1,15 +1,16 @@
 """A store's records go into etcd, Redis and PostgreSQL, and come back to the byte."""
 
+import base64
 import glob
+import json
 import os
-import pwd
 import shutil
 import subprocess
 import sys
-import time
 import unittest
 
-from harness import BUILD, PATH, SOURCE, EngineTest, environment, eventually, free_port, program
+from harness import (BUILD, SOURCE, EngineTest, environment, eventually, free_port, lines_of,
+                     program)
 
 RECORDS = os.path.join(BUILD, "tools/korvex-records/korvex-records")
 SCRIPT = os.path.join(SOURCE, "examples/fleet/records.py")
@@ -52,6 +53,13 @@ class Recipe:
             self.put(key, value)
         self.records("put", b"count/\xff\x01", "odd key")
 
+    def load(self, records):
+        """Puts many records at once."""
+        lines = [json.dumps({name: base64.b64encode(data).decode() for name, data in
+                             (("key_base64", key), ("value_base64", value))})
+                 for key, value in records.items()]
+        self.records("load", "--json", stdin="\n".join(lines).encode() + b"\n")
+
     def test_all_records_come_back_to_the_byte(self):
         self.fill()
         self.assertEqual(self.recipe("push", self.name), "8 put, 0 deleted, 0 left alone\n")
@@ -79,6 +87,46 @@ class Recipe:
         self.assertEqual(self.recipe("pull", self.name, "count/"), "7 records\n")
         self.assertEqual(self.records("get", "count/apple"), b"2")
         self.assertEqual(self.records("get", "other/more"), b"kept")
+
+    def test_many_and_large_changes_go_in_pieces(self):
+        many = {b"many/%04d" % number: BYTES for number in range(350)}
+        self.put("large", b"\0x" * 500000)
+        self.load(many)
+        self.assertEqual(self.recipe("push", self.name), "351 put, 0 deleted, 0 left alone\n")
+        before = self.records("dump")
+        self.recipe("pull", self.name)
+        self.assertEqual(self.records("dump"), before)
+
+    def test_a_save_is_pushed_while_watched(self):
+        self.put("count/apple", b"1")
+        watch = self.start([sys.executable, SCRIPT, "watch", self.name], env=self.environment())
+        said = self.file(os.path.basename(sys.executable) + ".err")
+        eventually(lambda: lines_of(said) == [b"1 put, 0 deleted, 0 left alone"], "the first push")
+        self.put("count/pear", b"2")
+        self.records("remove", "count/apple")
+        eventually(lambda: sum(int(line.split()[2]) for line in lines_of(said)) == 1, "the deletion")
+        self.stop(watch)
+        self.assertEqual(self.recipe("push", self.name), "0 put, 0 deleted, 1 left alone\n")
+
+    def test_a_store_without_a_file_or_with_half_of_one_deletes_nothing(self):
+        self.put("count/apple", b"1")
+        self.recipe("push", self.name)
+        path = self.file("db/hashDb/data")
+        with open(path, "r+b") as file:
+            for size in (os.path.getsize(path) - 1, 0):
+                file.truncate(size)
+                self.assertNotEqual(self.refused("push", self.name), b"")
+        os.remove(path)
+        self.assertEqual(self.refused("push", self.name),
+                         b"records.py: there is no record file, so nothing is changed\n")
+        self.put("count/apple", b"1")
+        self.assertEqual(self.recipe("push", self.name), "0 put, 0 deleted, 1 left alone\n")
+
+    def refused(self, *arguments):
+        result = subprocess.run([sys.executable, SCRIPT, *arguments], capture_output=True,
+                                env=self.environment())
+        self.assertEqual(result.returncode, 1, result.stdout)
+        return result.stderr
 
 
 class EtcdTest(Recipe, EngineTest):

@@ -5,7 +5,7 @@ import os
 import re
 import unittest
 
-from harness import (COUNT, ROOT, LIBRARY, EngineTest, Entry, environment, eventually, layouts,
+from harness import (COUNT, ROOT, LIBRARY, EngineTest, entry_of, environment, eventually, layouts,
                      lines_of, program)
 
 MODULES = os.path.join(ROOT, "usr/lib", LIBRARY, "rsyslog")
@@ -31,24 +31,19 @@ class RsyslogTest(EngineTest):
                            *modules], env=environment())
 
     def entries(self):
-        found = []
-        for line in lines_of(self.file("out.json")):
-            one = json.loads(line.decode())
-            found.append(Entry(one["level"], one.get("channel"), one.get("thread"),
-                               one["message"].encode()))
-        return found
+        return [entry_of(json.loads(line.decode())) for line in lines_of(self.file("out.json"))]
 
     def clear(self):
         for name in os.listdir(self.directory):
             if name.startswith(("app.log", "out.json")):
                 os.remove(self.file(name))
 
-    def check(self, layout, size=0, pause=0):
+    def check(self, layout, count=COUNT // 10, size=0, pause=0):
         self.clear()
         self.configure(layout, size)
         rsyslog = self.start_rsyslog()
         eventually(lambda: os.path.exists(self.file("pid")), "rsyslogd's start")
-        expected = self.shown(self.log(COUNT // 10, pause), layout)
+        expected = self.shown(self.log(count, pause), layout)
         if size:
             lost = self.last_of_backups()
             self.assertGreater(len(lost), 1)
@@ -64,7 +59,7 @@ class RsyslogTest(EngineTest):
                 self.check(layout)
 
     def test_of_a_log_that_is_rotated_it_loses_the_last_message_of_each_file(self):
-        self.check(layouts()[0], size=700000, pause=3000)
+        self.check(layouts()[0], count=10000, size=700000, pause=3000)
 
 
 if __name__ == "__main__":

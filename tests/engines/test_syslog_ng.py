@@ -6,7 +6,7 @@ import os
 import re
 import unittest
 
-from harness import (COUNT, ROOT, EngineTest, Entry, environment, eventually, layouts, lines_of,
+from harness import (COUNT, ROOT, EngineTest, entry_of, environment, eventually, layouts, lines_of,
                      program)
 
 MODULES = glob.glob(os.path.join(ROOT, "usr/lib/syslog-ng/[0-9]*"))
@@ -33,19 +33,14 @@ class SyslogNgTest(EngineTest):
                            *modules], env=environment())
 
     def entries(self):
-        found = []
-        for line in lines_of(self.file("out.json")):
-            one = json.loads(line.decode())
-            found.append(Entry(one["level"], one.get("channel"), one.get("thread"),
-                               one["message"].encode()))
-        return found
+        return [entry_of(json.loads(line.decode())) for line in lines_of(self.file("out.json"))]
 
     def clear(self):
         for name in os.listdir(self.directory):
             if name.startswith(("app.log", "out.json", "persist", "ctl")):
                 os.remove(self.file(name))
 
-    def check(self, layout, size=0, pause=0):
+    def check(self, layout, count=COUNT // 10, size=0, pause=0):
         self.clear()
         self.configure(layout, size)
         self.write("app.log", "")
@@ -53,7 +48,7 @@ class SyslogNgTest(EngineTest):
         eventually(lambda: os.path.exists(self.file("ctl")), "syslog-ng's start")
         # It takes newlines and carriage returns off a message's end.
         expected = [one._replace(message=one.message.rstrip(b"\r\n"))
-                    for one in self.shown(self.log(COUNT // 10, pause), layout)]
+                    for one in self.shown(self.log(count, pause), layout)]
         if size:
             lost = self.last_of_backups()
             self.assertGreater(len(lost), 1)
@@ -69,7 +64,7 @@ class SyslogNgTest(EngineTest):
                 self.check(layout)
 
     def test_of_a_log_that_is_rotated_it_loses_the_last_message_of_each_file(self):
-        self.check(layouts()[0], size=700000, pause=3000)
+        self.check(layouts()[0], count=10000, size=700000, pause=3000)
 
 
 if __name__ == "__main__":

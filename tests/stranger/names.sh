@@ -22,7 +22,7 @@ if compile "$folder/names/Own.cc" 2> "$build/errors"; then exit 1; fi
 grep -Eq 'ambiguous' "$build/errors"
 # With it nothing of Korvex's is found by its short name.
 for name in Logger ERROR Mutex; do
-    printf '#include <korvex/util/Logger.h>\nusing ::%s;\n' $name > "$build/short.cc"
+    printf '#include <korvex/util/Logger.h>\n#include <korvex/util/Thread.h>\nusing ::%s;\n' $name > "$build/short.cc"
     compile "$build/short.cc"
     if compile "$build/short.cc" -DKORVEX_QUALIFIED_NAMES 2> /dev/null; then exit 1; fi
 done

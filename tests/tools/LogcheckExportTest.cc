@@ -148,13 +148,16 @@ TEST_F(LogcheckExportTest, TheLayoutsOfTheDocumentationAreJudged) {
     EXPECT_GT(judged, 20U);
 }
 
-TEST_F(LogcheckExportTest, TheDatesOfTheDocumentationAreJudged) {
+TEST_F(LogcheckExportTest, TheDatesOfTheDocumentationAreJudgedAndTriedWithTheEngines) {
+    const std::string tried = readFile(KORVEX_SOURCE_DIR "/tests/engines/layouts.txt");
     std::ifstream table(KORVEX_SOURCE_DIR "/docs/samples/dates.out");
     std::vector<std::string> accepted;
     for (std::string line; std::getline(table, line);) {
         if (line.rfind("| `", 0) != 0) continue;
         const std::string date = line.substr(3, line.find("` |") - 3);
-        if (doubt(date + " %-5p [%t] %c: %m%n").empty()) accepted.push_back(date);
+        if (!doubt(date + " %-5p [%t] %c: %m%n").empty()) continue;
+        accepted.push_back(date);
+        EXPECT_THAT(tried, HasSubstr(date + ' '));
     }
     EXPECT_THAT(accepted, testing::ElementsAre("%d", "%d{}", "%d{ISO8601}", "%d{DATE}",
                                                "%d{%Y-%m-%dT%H:%M:%S%z}", "%d{%s.%l}", "%-26dx"));

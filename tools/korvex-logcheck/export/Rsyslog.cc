@@ -17,13 +17,14 @@ std::string preamble(const std::string& source) {
            "module(load=\"imfile\")\n"
            "module(load=\"mmnormalize\")\n"
            "\n"
-           "# Where the JSON goes.\n"
+           "# Where the JSON goes. No queue.timeoutEnqueue: with a long one, a queue that is full\n"
+           "# waits for itself, for ever.\n"
            "template(name=\"korvex_json\" type=\"string\" string=\"%$!korvex%\\n\")\n"
            "ruleset(name=\"korvex_out\") {\n"
            "    action(type=\"omfwd\" target=\"127.0.0.1\" port=\"10514\" protocol=\"tcp\"\n"
            "        template=\"korvex_json\" action.resumeRetryCount=\"-1\"\n"
-           "        queue.type=\"linkedList\" queue.filename=\"korvex_out\"\n"
-           "        queue.maxDiskSpace=\"1g\" queue.saveOnShutdown=\"on\")\n"
+           "        queue.type=\"disk\" queue.filename=\"korvex_out\" queue.size=\"5000000\"\n"
+           "        queue.saveOnShutdown=\"on\" queue.checkpointInterval=\"1\")\n"
            "}\n";
 }
 
