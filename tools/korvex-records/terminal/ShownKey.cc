@@ -18,7 +18,9 @@ locale_t utf8Locale() {
         const locale_t users = newlocale(LC_CTYPE_MASK, "", nullptr);
         const bool isUtf8 =
             users != nullptr && std::string_view(nl_langinfo_l(CODESET, users)) == "UTF-8";
-        return isUtf8 ? users : nullptr;
+        if (isUtf8) return users;
+        if (users != nullptr) freelocale(users);
+        return locale_t();
     }();
     return kLocale;
 }
