@@ -105,6 +105,9 @@ TEST(InterruptedTest, AHandlerThatLogsWhereverItInterruptsLoggingComesThrough) {
 }
 
 TEST(InterruptedTest, ACancelledThreadFinishesItsLineAndEnds) {
+#ifdef __SANITIZE_ADDRESS__
+    GTEST_SKIP() << "the address sanitizer takes the stack that a cancelled thread left for in use";
+#endif
     const TempDir dir;
     const ChildResult result = runInChild([&] {
         logTo(dir.file("log"));
