@@ -1,5 +1,7 @@
 #include "util/Logger/WriterGate.h"
 
+#include "base/CancelShield.h"
+
 inline namespace korvex {
 
 // What these calls return is not looked at: with mutexes and conditions of these kinds, and one
@@ -7,6 +9,7 @@ inline namespace korvex {
 
 void WriterGate::shut() noexcept {
     if ((_word.fetch_or(kShut, std::memory_order_acquire) & ~kShut) == 0) return;
+    const CancelShield shield;  // a thread that is to be cancelled may fork; waiting would end it
     pthread_mutex_lock(&_mutex);
     while (_word.load(std::memory_order_acquire) != kShut)
         pthread_cond_wait(&_empty, &_mutex);

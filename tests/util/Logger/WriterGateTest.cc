@@ -54,6 +54,25 @@ TEST(WriterGateTest, ShuttingWaitsForAllInsideAndLetsNobodyElseIn) {
     EXPECT_FALSE(gate.enter());
 }
 
+// As a thread does that forks, and whose cancellation was asked for.
+TEST(WriterGateTest, ShuttingIsNoPointAtWhichAThreadIsCancelled) {
+    WriterGate gate;
+    gate.open();
+    ASSERT_TRUE(gate.enter());
+    std::atomic<bool> shut{false};
+    std::thread shutter([&] {
+        pthread_cancel(pthread_self());
+        gate.shut();
+        shut = true;
+        pthread_setcancelstate(PTHREAD_CANCEL_DISABLE, nullptr);  // std::thread cannot be cancelled
+    });
+    while (gate.enter())
+        gate.leave();
+    gate.leave();
+    shutter.join();
+    EXPECT_TRUE(shut);
+}
+
 // Who is turned away, all the time, must leave nothing behind that the child would wait for.
 TEST(WriterGateTest, AChildOfAForkFindsItUsableIfItWasShut) {
     WriterGate gate;
