@@ -5,7 +5,7 @@
 #include <unistd.h>
 
 #include <functional>
-#include <regex>
+#include <string>
 #include <utility>
 
 namespace testsupport {
@@ -46,13 +46,20 @@ class Runner : public Thread {
 
 // A pattern of the layout's dates alone, from the first to the last, without their widths.
 std::string datesOf(const std::string& layout) {
-    static const std::regex date(R"(%[-0-9]*d((\{[^}]*\})?))");
     std::string dates;
-    std::ptrdiff_t end = 0;
-    for (std::sregex_iterator one(layout.begin(), layout.end(), date), none; one != none; ++one) {
-        if (!dates.empty()) dates += layout.substr(end, one->position() - end);
-        dates += "%d" + one->str(1);
-        end = one->position() + one->length();
+    std::size_t end = 0;
+    for (auto at = layout.find('%'); at != std::string::npos; at = layout.find('%', at)) {
+        const auto letter = layout.find_first_not_of("-0123456789", at + 1);
+        if (letter == std::string::npos) break;
+        if (layout[letter] != 'd') {
+            at = letter;
+            continue;
+        }
+        if (!dates.empty()) dates += layout.substr(end, at - end);
+        const bool hasFormat = layout.compare(letter + 1, 1, "{") == 0;
+        end = (hasFormat ? layout.find('}', letter) : letter) + 1;
+        at = end;
+        dates += "%" + layout.substr(letter, end - letter);
     }
     return dates;
 }
