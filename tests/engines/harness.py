@@ -1,6 +1,7 @@
 """What the tests with real log engines share."""
 
 import collections
+import json
 import os
 import re
 import shutil
@@ -151,10 +152,52 @@ class EngineTest(unittest.TestCase):
                                 "channel": one.channel[cut["channel"]], **hidden})
                 for one in entries]
 
+    def assert_same(self, found, expected):
+        """Compares lists too long for assertEqual's report."""
+        for number, (one, other) in enumerate(zip(found, expected)):
+            self.assertEqual(one, other, "entry %d" % number)
+        self.assertEqual(len(found), len(expected))
+
+
+class Following:
+    """What is tested of an engine that follows a log and writes each message as JSON: out.json.
+
+    A test class sets READY, a file that is there once the engine runs, and KEPT, the beginnings of
+    the names under which the engine keeps how far it has read. start_engine() starts it."""
+
+    def given(self, entry):
+        """The entry as the engine gives it."""
+        return entry
+
+    def check(self, layout, count, size=COUNT * 40, pause=0):
+        self.forget_all()
+        self.configure(layout, size)
+        self.write("app.log", "")
+        engine = self.start_engine()
+        eventually(lambda: os.path.exists(self.file(self.READY)), "the engine's start")
+        expected = [self.given(one) for one in self.shown(self.log(count, pause), layout)]
+        lost = self.last_of_backups()
+        expected = [one for number, one in enumerate(expected) if number not in lost]
+        eventually(lambda: len(lines_of(self.file("out.json"))) >= len(expected),
+                   "all lines in the JSON", 60)
+        self.stop(engine)
+        self.assert_same([entry_of(json.loads(line.decode()))
+                          for line in lines_of(self.file("out.json"))], expected)
+        return lost
+
+    def forget_all(self):
+        for name in os.listdir(self.directory):
+            if not name.startswith(("app.log", "out.json", *self.KEPT)):
+                continue
+            if os.path.isdir(self.file(name)):
+                shutil.rmtree(self.file(name))
+            else:
+                os.remove(self.file(name))
+
     def last_of_backups(self):
-        """The numbers of the messages that are the last of a file that was rotated away, of the first
-        of the layouts."""
-        begin = re.compile(rb"^[0-9-]{10} [0-9:]{8},[0-9]{3} \[[A-Za-z0-9 -]+\] [A-Z?]+ +[a-z.1-]+: ")
+        """The numbers of the messages that are the last of a file that was rotated away."""
+        quoted = re.search(r'startmsg.regex="(.*)"', self.export("rsyslog")).group(1)
+        begin = re.compile(re.sub(r"\\(.)", r"\1", quoted).replace("[:space:]", r"\s").encode())
         backups = [name for name in os.listdir(self.directory) if name.startswith("app.log.")]
         numbers = []
         count = 0
@@ -164,8 +207,12 @@ class EngineTest(unittest.TestCase):
             numbers.append(count - 1)
         return numbers
 
-    def assert_same(self, found, expected):
-        """Compares lists too long for assertEqual's report."""
-        for number, (one, other) in enumerate(zip(found, expected)):
-            self.assertEqual(one, other, "entry %d" % number)
-        self.assertEqual(len(found), len(expected))
+    def test_every_message_comes_as_json_in_order(self):
+        for layout in layouts():
+            with self.subTest(layout):
+                self.assertEqual(self.check(layout, COUNT // 10), [])
+
+    def test_of_a_log_that_is_rotated_it_loses_the_last_message_of_each_file(self):
+        for layout in layouts():
+            with self.subTest(layout):
+                self.assertGreater(len(self.check(layout, 6000, size=500000, pause=3000)), 1)
