@@ -22,7 +22,9 @@ NAMES = 2500  # counted by each daemon
 # What rsyslog was about to send when it was ended comes behind what waited.
 BATCH = 128
 # What RELP may have on its way: it comes once more when the collector is killed.
-WINDOW = 128
+WINDOW = 512
+# So many changes of the queue rsyslog may forget when it is killed.
+CHECKPOINT = 100
 
 
 def late(came, logged):
@@ -228,7 +230,7 @@ class FleetTest(Fleet):
             self.assertLess(daemon.waiting(), 2000 * lines)
             daemon.start_forwarder()
         self.start_collector()
-        self.check(displaced=BATCH, repeated=BATCH)
+        self.check(displaced=BATCH, repeated=WINDOW)
 
     def test_a_queue_that_was_full_is_sent_and_little_was_thrown_away(self):
         for daemon in self.daemons:
@@ -250,6 +252,28 @@ class FleetTest(Fleet):
             self.assertLess(len(logged) - len(came), 60)  # one in two seconds
             arrived = set(came)
             self.assertLessEqual(late(came, [line for line in logged if line in arrived]), BATCH)
+
+    def test_a_forwarder_that_is_killed_goes_on_close_to_where_it_was(self):
+        daemon = self.daemons[0]
+        daemon.log_every_name(10000000)
+        self.start_collector()
+        daemon.start_forwarder()
+        daemon.start()
+        for kill in range(3):
+            for number in range(kill * 1000, (kill + 1) * 1000):
+                daemon.count("name%06d" % number)
+                time.sleep(1 / 2000)
+            self.stop(daemon.forwarder, signal.SIGKILL)
+            daemon.start_forwarder()
+        self.check_the_end_arrives(daemon)
+        came = [one[2].split()[-1] for one in self.received(daemon) if b"counted name" in one[2]]
+        logged = [line.split()[-1] for _, line in daemon.logged("RECEIVER", "receiver.log")
+                  if b"counted name" in line]
+        self.assertGreater(len(logged), 2000)
+        self.assertEqual(set(came) - set(logged), set())
+        print("%d of %d lines lost, %d came again" % (len(set(logged) - set(came)), len(logged),
+                                                      len(came) - len(set(came))))
+        self.assertLessEqual(len(set(logged) - set(came)), 3 * CHECKPOINT)
 
     def check_the_end_arrives(self, daemon):
         def arrived():
