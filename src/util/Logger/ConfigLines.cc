@@ -61,10 +61,11 @@ bool ConfigLines::next(std::string& content) {
 void ConfigLines::joinAroundComments(std::string& joined) {
     joined.clear();
     for (std::size_t pos = 0; pos < _line.size();) {
-        const char c = _line[pos++];
-        joined += c;
-        if (c == '#') return;
-        if (c != '-' || !endsWith(joined, kCommentStart)) continue;
+        const std::size_t length = std::strcspn(&_line[pos], "#-");
+        joined.append(_line, pos, length + 1);
+        pos += length + 1;
+        if (joined.back() == '#') return;
+        if (joined.back() != '-' || !endsWith(joined, kCommentStart)) continue;
         joined.resize(joined.size() - kCommentStart.size());
         xml_comment_startline_ = lineno_;
         if (!handle_xml_comment(pos)) return;

@@ -4,23 +4,23 @@
 
 #include "util/Logger/RootObjects.h"
 
-#include <algorithm>
+#include <cstring>
 #include <string_view>
 
 inline namespace korvex {
 
 namespace {
 
-constexpr std::string_view kBlanks = " \t";
+constexpr const char* kBlanks = " \t";
 constexpr std::string_view kPrefix = "log4cpp.";
 
 // The first position from `from` on that holds one of the delimiters; the line's size when none.
-std::size_t findDelimiter(const std::string& line, std::size_t from, std::string_view delimiters) {
-    return std::min(line.find_first_of(delimiters, from), line.size());
+std::size_t findDelimiter(const std::string& line, std::size_t from, const char* delimiters) {
+    return from + std::strcspn(line.c_str() + from, delimiters);
 }
 
 std::size_t skipBlanks(const std::string& line, std::size_t from) {
-    return std::min(line.find_first_not_of(kBlanks, from), line.size());
+    return from + std::strspn(line.c_str() + from, kBlanks);
 }
 
 bool isAt(const std::string& line, std::size_t pos, char c) {
