@@ -98,7 +98,7 @@ Directory readDirectory(const std::string& path,
     for (const auto& entry : fs::directory_iterator(path)) {
         const std::string file = entry.path().string();
         if (!fs::is_regular_file(entry.symlink_status())) {
-            throw std::runtime_error(file + " is no regular file");
+            throw std::runtime_error(file + " is not a regular file");
         }
         const Inode inode = numberOf(fileIdOf(file));
         directory.names[entry.path().filename().string()] = inode;

@@ -130,7 +130,7 @@ TEST_F(LogcheckExportTest, TheMessageIsTheEndOfTheLine) {
     expectDoubt("%d %.0m%n", "it does not print the message (%m)");
     expectDoubt("%d %m", "its lines do not end (%n)");
     expectDoubt("%d %m [%c]%n",
-                "the message may be of any text, so nothing but %n can come behind it");
+                "the message may be of any text, so nothing but %n can come after it");
     expectDoubt("%d%n%m%n", "a newline stands in front of the message");
     EXPECT_EQ(doubt("%d %.100m%n"), "");
 }

@@ -230,7 +230,7 @@ TEST_F(LogcheckFilesTest, LimitsThatCannotWork) {
 TEST_F(LogcheckFilesTest, ANumberWithAUnitSaysTheNumber) {
     EXPECT_THAT(findings(good + "appender.A.maxFileSize=10MB\nappender.A.maxBackupIndex=0\n"),
                 ElementsAre("3:24: error: Parse error at \"appender.A.maxFileSize=10MB\": "
-                            "\"10MB\" is no plain number: digits only, nothing behind them; the "
+                            "\"10MB\" is not a plain number; use digits only; the "
                             "unit is the byte; did you mean \"10485760\"? [number.unit]"));
     const auto number = [&](const std::string& text) {
         const std::string before = good + "appender.A.maxFileSize=";
@@ -259,7 +259,7 @@ TEST_F(LogcheckFilesTest, ANumberWithAUnitSaysTheNumber) {
 TEST_F(LogcheckFilesTest, AUnitIsNothingForANumberOfBackups) {
     EXPECT_THAT(findings(good + "appender.A.maxFileSize=4096\nappender.A.maxBackupIndex=5k\n"),
                 ElementsAre("4:27: error: Parse error at \"appender.A.maxBackupIndex=5k\": \"5k\" "
-                            "is no plain number: digits only, nothing behind them "
+                            "is not a plain number; use digits only "
                             "[number.form]"));
 }
 
@@ -267,15 +267,16 @@ TEST_F(LogcheckFilesTest, ABlankBehindAValue) {
     EXPECT_THAT(
         findings(good + "appender.A.maxFileSize=4096 # bytes\nappender.A.maxBackupIndex=1#x\n"
                         "appender.A.layout=BasicLayout \n"),
-        ElementsAre("3:24: error: Parse error at \"appender.A.maxFileSize=4096 \": \"4096 \" is "
-                    "no plain number: a blank or \"#\" behind it belongs to it; did you mean "
-                    "\"4096\"? [value.refused-tail]",
-                    "4:27: error: Parse error at \"appender.A.maxBackupIndex=1#\": \"1#\" is no "
-                    "plain number: a blank or \"#\" behind it belongs to it; did you mean \"1\"? "
-                    "[value.refused-tail]",
-                    "5:19: error: Parse error at \"appender.A.layout=BasicLayout \": "
-                    "\"BasicLayout \" is no layout: a blank or \"#\" behind it belongs to it; did "
-                    "you mean \"BasicLayout\"? [value.refused-tail]"));
+        ElementsAre(
+            "3:24: error: Parse error at \"appender.A.maxFileSize=4096 \": \"4096 \" is "
+            "not a plain number; a blank or \"#\" after it is part of the value; did you mean "
+            "\"4096\"? [value.refused-tail]",
+            "4:27: error: Parse error at \"appender.A.maxBackupIndex=1#\": \"1#\" is not a "
+            "plain number; a blank or \"#\" after it is part of the value; did you mean \"1\"? "
+            "[value.refused-tail]",
+            "5:19: error: Parse error at \"appender.A.layout=BasicLayout \": "
+            "\"BasicLayout \" is not a layout; a blank or \"#\" after it is part of the value; did "
+            "you mean \"BasicLayout\"? [value.refused-tail]"));
     EXPECT_EQ(fixed(good + "appender.A.maxFileSize=4096 # bytes\nappender.A.maxBackupIndex=1#x\n"
                            "appender.A.layout=BasicLayout   \n"),
               good +
@@ -288,11 +289,11 @@ TEST_F(LogcheckFilesTest, AValueThatKeepsWhatIsBehindIt) {
                          "appender.A.fileName=/a.log # here\n"
                          "appender.B.fileName=/b.log# here\n"
                          "appender.B.layout.ConversionPattern=%m%n\t\n"),
-                ElementsAre("2:27: warning: fileName keeps the blank behind it: \"/a.log \"; did "
+                ElementsAre("2:27: warning: fileName keeps the blank after it: \"/a.log \"; did "
                             "you mean \"/a.log\"? [value.tail]",
                             "3:27: warning: fileName keeps the \"#\" that follows it directly: "
                             "\"/b.log#\"; did you mean \"/b.log\"? [value.tail]",
-                            "4:41: warning: layout.ConversionPattern keeps the blank behind it: "
+                            "4:41: warning: layout.ConversionPattern keeps the blank after it: "
                             "\"%m%n\\x09\"; did you mean \"%m%n\"? [value.tail]"));
     EXPECT_EQ(fixed("rootCategory=A\nappender.A.fileName=/a.log # here\n"),
               "rootCategory=A\n# here\nappender.A.fileName=/a.log\n");

@@ -25,14 +25,14 @@ TEST_F(LogcheckKeysTest, AKeyInTheWrongCase) {
     EXPECT_THAT(
         findings(good + "rootcategory=INFO\n log4cpp.Category.net =INFO\nappender.A.filename=/b\n"
                         "Appender.A.Layout.conversionpattern=%m%n\n"),
-        ElementsAre("3:1: error: Parse error at \"rootcategory=INFO\": upper and lower case are "
-                    "different letters; did you mean \"rootCategory\"? [key.case]",
-                    "4:2: error: Parse error at \"Category.net =INFO\": upper and lower case are "
-                    "different letters; did you mean \"log4cpp.category.net\"? [key.case]",
+        ElementsAre("3:1: error: Parse error at \"rootcategory=INFO\": upper and lower case "
+                    "differ; did you mean \"rootCategory\"? [key.case]",
+                    "4:2: error: Parse error at \"Category.net =INFO\": upper and lower case "
+                    "differ; did you mean \"log4cpp.category.net\"? [key.case]",
                     "5:12: error: Parse error at \"appender.A.filename=/b\": " + kAttributes +
                         "; did you mean \"fileName\"? [key.case]",
                     "6:1: error: Parse error at \"Appender.A.Layout.conversionpattern=%m%n\": "
-                    "upper and lower case are different letters; did you mean "
+                    "upper and lower case differ; did you mean "
                     "\"appender.A.layout.ConversionPattern\"? [key.case]"));
     EXPECT_EQ(fixed("rootcategory=INFO\n log4cpp.Category.net =INFO\n"
                     "appender.rootAppender.Layout=SimpleLayout\n"),
@@ -134,7 +134,7 @@ TEST_F(LogcheckKeysTest, AWordThatIsNeitherALevelNorAnAppenderIsOneMessage) {
                     "3:12: error: Parse error at \"x=NOBODY, MAIN\": \"NOBODY\" is neither a "
                     "level nor an appender [word.unknown]",
                     "4:12: error: Parse error at \"y=\"MAIN\", stderr\": \"\"MAIN\"\" is neither "
-                    "a level nor an appender; quotation marks belong to a word; the category "
+                    "a level nor an appender; quotation marks are part of the word; the category "
                     "names no appender that exists, so it writes to rootAppender; did you mean "
                     "\"MAIN\"? [word.unknown]",
                     "4:20: error: Parse error at \"y=\"MAIN\", stderr\": \"stderr\" is neither a "
@@ -156,11 +156,12 @@ TEST_F(LogcheckKeysTest, AnAppenderThatOnlyARefusedLineNamesIsNotCalledUnused) {
 TEST_F(LogcheckKeysTest, LevelsInTheWrongCaseAndOfOtherNames) {
     EXPECT_THAT(
         findings(good + "category.x=Warn, A\ncategory.y=WARNING\n"),
-        ElementsAre("3:12: error: Parse error at \"x=Warn, A\": \"Warn\" is neither a level nor "
-                    "an appender; levels are in upper case; did you mean \"WARN\"? [level.case]",
-                    "4:12: error: Parse error at \"y=WARNING\": \"WARNING\" is neither a level "
-                    "nor an appender; the level is called so elsewhere; did you mean \"WARN\"? "
-                    "[level.other-name]"));
+        ElementsAre(
+            "3:12: error: Parse error at \"x=Warn, A\": \"Warn\" is neither a level nor "
+            "an appender; levels are in upper case; did you mean \"WARN\"? [level.case]",
+            "4:12: error: Parse error at \"y=WARNING\": \"WARNING\" is neither a level "
+            "nor an appender; that is a level name of other libraries; did you mean \"WARN\"? "
+            "[level.other-name]"));
     EXPECT_EQ(fixed("rootCategory=debug\ncategory.a = Warning\ncategory.b=trace\ncategory.c=err\n"
                     "category.d=CRITICAL\ncategory.e=off\ncategory.f='notice'\n"),
               "rootCategory=DEBUG\ncategory.a = WARN\ncategory.b=DEBUG\ncategory.c=ERROR\n"
@@ -178,7 +179,7 @@ TEST_F(LogcheckKeysTest, LevelsInTheWrongCaseAndOfOtherNames) {
 TEST_F(LogcheckKeysTest, AHashDirectlyBehindAWord) {
     EXPECT_THAT(findings(good + "category.x=WARN, A# main\n"),
                 ElementsAre("3:18: error: Parse error at \"x=WARN, A#\": \"A#\" is neither a "
-                            "level nor an appender; a \"#\" right behind a word belongs to it; "
+                            "level nor an appender; a \"#\" right after a word is part of it; "
                             "the category names no appender that exists, so it writes to A; did "
                             "you mean \"A\"? [word.hash]"));
     EXPECT_EQ(fixed(good + "category.x=WARN, A# main\n"), good + "category.x=WARN, A # main\n");
@@ -281,11 +282,12 @@ TEST_F(LogcheckKeysTest, LoggersWithAttributes) {
 TEST_F(LogcheckKeysTest, ALineThatIsToGoOnInTheNext) {
     EXPECT_THAT(
         findings("rootCategory=INFO, \\\n    A\nappender.A.fileName=/a\n"),
-        ElementsAre("1:20: error: Parse error at \"INFO, \\\": \"\\\" is neither a level nor "
-                    "an appender; a line ends where it ends; the root names no appender "
-                    "that exists, so it writes to rootAppender [word.unknown]",
-                    "2:5: error: Parse error at \"A\": a backslash does not carry a line on "
-                    "to the next one [key.unknown]"));
+        ElementsAre(
+            "1:20: error: Parse error at \"INFO, \\\": \"\\\" is neither a level nor "
+            "an appender; a line cannot be continued on the next one; the root names no appender "
+            "that exists, so it writes to rootAppender [word.unknown]",
+            "2:5: error: Parse error at \"A\": a backslash does not carry a line on "
+            "to the next one [key.unknown]"));
 }
 
 TEST_F(LogcheckKeysTest, WordsBetweenOtherSignsThanCommas) {

@@ -96,7 +96,7 @@ TEST_F(LogcheckPatternsTest, ADateOutsideOfItsBracesIsToldOnce) {
 
 TEST_F(LogcheckPatternsTest, ABlankInAConversion) {
     EXPECT_THAT(told("% m%n"), ElementsAre("1: " + nothing("% ") +
-                                           ", and the letter behind it is text; did you mean "
+                                           ", and the letter after it is text; did you mean "
                                            "\"%m\"? [pattern.unknown]"));
     EXPECT_EQ(mended("%- p 50% of %m%n"), "%-p 50% of %m%n");
 }
@@ -146,7 +146,7 @@ TEST_F(LogcheckPatternsTest, AConversionThatThePatternsEndCuts) {
 
 TEST_F(LogcheckPatternsTest, AnArgumentWhereNoneCounts) {
     EXPECT_THAT(told("%-5c{2} %m%n"),
-                ElementsAre("5: warning: \"{2}\" has no effect behind %c: only %d takes an "
+                ElementsAre("5: warning: \"{2}\" has no effect after %c: only %d takes an "
                             "argument; a width, as in %.20c, cuts the text; did you mean "
                             "\"%-5c\"? [pattern.argument]"));
     EXPECT_EQ(mended("%-5c{2} %m{}%n{x}"), "%-5c %m%n");

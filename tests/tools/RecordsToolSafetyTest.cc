@@ -100,7 +100,7 @@ TEST_F(SafetyTest, AFifoOrADeviceDoesNotHoldTheToolUp) {
     for (const std::string& file : {fifo, zero, dir.path()}) {
         const ChildResult result = run({"-f", file, "put", "a", "1"});
         EXPECT_EQ(result.status, 4);
-        EXPECT_EQ(result.err, "korvex-records: " + file + ": no regular file\n");
+        EXPECT_EQ(result.err, "korvex-records: " + file + ": not a regular file\n");
     }
 }
 

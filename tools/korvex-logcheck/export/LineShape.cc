@@ -78,7 +78,7 @@ void checkEnd(const Fields& fields) {
     const auto behind = message + 1;
     if (behind == fields.end()) throw Doubt("its lines do not end (%n)");
     if (behind->kind != LineField::TEXT || behind->text != "\n" || behind + 1 != fields.end()) {
-        throw Doubt("the message may be of any text, so nothing but %n can come behind it");
+        throw Doubt("the message may be of any text, so nothing but %n can come after it");
     }
 }
 

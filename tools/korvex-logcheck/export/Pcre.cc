@@ -5,7 +5,7 @@
 std::string writePcre(const ExportedFiles& files, const std::string& source) {
     std::string all = remark("pcre", source);
     all +=
-        "# Each matches a message of the file with the newline behind it, and the next one when\n"
+        "# Each matches a message of the file with the newline after it, and the next one when\n"
         "# matched again from there.\n";
     for (const ExportedFile& file : files) {
         const std::string begin = headRegex(file.shape, kPerlStyle, false).substr(1);

@@ -97,7 +97,7 @@ class RuleWriter {
         _rule += parser(name, "word");
         // The next text's blanks are looked for where the padding ends.
         if (field.filling == LineField::BLANKS_BEHIND) {
-            throw Inexpressible("blanks behind the " + name + " cannot be skipped");
+            throw Inexpressible("blanks after the " + name + " cannot be skipped");
         }
     }
 
@@ -135,7 +135,7 @@ class RuleWriter {
         }
         const LineField* const behind = next(field);
         if (behind == nullptr || behind->kind != LineField::TEXT) {
-            throw Inexpressible("where the date ends cannot be told without a text behind it");
+            throw Inexpressible("where the date ends cannot be told without a text after it");
         }
         if (!isBlank(behind->text.substr(0, 1)) && plain.find(behind->text) != plain.npos) {
             throw Inexpressible("where the date ends cannot be told: " + jsonString(behind->text) +

@@ -42,7 +42,7 @@ void checkNumber(const Reading& reading, const ConfigStatement& said, Findings& 
     if (isValidUint(bare.c_str())) {
         return tell(to, Code::VALUE_REFUSED_TAIL, value.place(),
                     error + quoted(said.value) +
-                        " is no plain number: a blank or \"#\" behind it belongs to it",
+                        " is not a plain number; a blank or \"#\" after it is part of the value",
                     bare, mend(reading.source, value, bare));
     }
     MeantNumber meant = meantNumber(said.value);
@@ -52,7 +52,7 @@ void checkNumber(const Reading& reading, const ConfigStatement& said, Findings& 
         meant.digits.empty() ? std::vector<Edit>() : mend(reading.source, value, meant.digits);
     tell(to, meant.unit && bytes && !meant.digits.empty() ? Code::NUMBER_UNIT : Code::NUMBER_FORM,
          value.place(),
-         error + quoted(said.value) + " is no plain number: digits only, nothing behind them" +
+         error + quoted(said.value) + " is not a plain number; use digits only" +
              (bytes ? "; the unit is the byte" : ""),
          meant.digits, edits);
 }
@@ -86,7 +86,8 @@ void checkLayout(const Reading& reading, const ConfigStatement& said, Findings& 
         tell(to, Code::LAYOUT_CASE, value.place(), error + kLayouts, meant, edits);
     } else {
         tell(to, Code::VALUE_REFUSED_TAIL, value.place(),
-             error + quoted(said.value) + " is no layout: a blank or \"#\" behind it belongs to it",
+             error + quoted(said.value) +
+                 " is not a layout; a blank or \"#\" after it is part of the value",
              meant, edits);
     }
 }

@@ -26,9 +26,9 @@ std::set<unsigned> understoodLines(const Configuration& config) {
 
 std::string reasonOf(Code slip) {
     if (slip == Code::KEY_PREFIX) return "the prefix of a key is \"log4cpp.\", or there is none";
-    if (slip == Code::KEY_CASE) return "upper and lower case are different letters";
+    if (slip == Code::KEY_CASE) return "upper and lower case differ";
     if (slip == Code::KEY_COLON) return "a key ends with \"=\"";
-    return "it is called so elsewhere, not here";
+    return "that is a key of other libraries";
 }
 
 void tellMended(const Reading& reading, const SourceLine& line, const MendedKey& mended,

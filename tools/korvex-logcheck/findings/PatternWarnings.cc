@@ -125,7 +125,7 @@ class PatternCheck {
         } else {
             const Piece argument = _value.part(part.brace, part.end - part.brace);
             tell(_to, Code::PATTERN_ARGUMENT, argument.place(),
-                 quoted(argument.text()) + " has no effect behind %" + part.letter +
+                 quoted(argument.text()) + " has no effect after %" + part.letter +
                      ": only %d takes an argument; a width, as in %.20" + part.letter +
                      ", cuts the text",
                  std::string(_pattern.substr(part.begin, part.brace - part.begin)),
@@ -161,7 +161,7 @@ class PatternCheck {
         _messageTold = _messageTold || letter == 'm';
         tell(_to, Code::PATTERN_UNKNOWN, conversion.place(),
              "there is no conversion " + quoted(conversion.text()) +
-                 ": it prints nothing, and the letter behind it is text",
+                 ": it prints nothing, and the letter after it is text",
              std::string(conversion.text().substr(0, conversion.size() - 1)) + letter,
              conversion.part(conversion.size() - 1, 1).replacedBy(""));
     }

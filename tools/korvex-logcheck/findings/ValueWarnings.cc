@@ -27,7 +27,7 @@ void checkTail(const Reading& reading, const ConfigStatement& said, Findings& to
     const std::string meant(sure ? value.text().substr(0, value.size() - 1) : "");
     tell(to, Code::VALUE_TAIL, tail.place(),
          said.attribute + " keeps " +
-             (blank ? "the blank behind it" : "the \"#\" that follows it directly") + ": " +
+             (blank ? "the blank after it" : "the \"#\" that follows it directly") + ": " +
              quoted(said.value),
          meant, sure ? tail.cutWithTail(reading.source) : std::vector<Edit>());
 }

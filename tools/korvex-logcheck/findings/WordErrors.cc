@@ -41,11 +41,12 @@ std::string seen(std::string_view word) {
 Slip slipOf(const Configuration& config, const std::string& word, bool mayBeLevel) {
     if (word.back() == '#') {
         const std::string before = word.substr(0, word.size() - 1);
-        return {Code::WORD_HASH, "; a \"#\" right behind a word belongs to it", before, true};
+        return {Code::WORD_HASH, "; a \"#\" right after a word is part of it", before, true};
     }
-    if (word == "\\") return {Code::WORD_UNKNOWN, "; a line ends where it ends", "", false};
+    if (word == "\\")
+        return {Code::WORD_UNKNOWN, "; a line cannot be continued on the next one", "", false};
     const std::string bare(withoutQuotes(word));
-    const std::string reason = bare == word ? "" : "; quotation marks belong to a word";
+    const std::string reason = bare == word ? "" : "; quotation marks are part of the word";
     const std::string inUpperCase = levelInOtherCase(bare);
     if (!inUpperCase.empty()) {
         return {mayBeLevel ? Code::LEVEL_CASE : Code::WORD_UNKNOWN,
@@ -53,7 +54,8 @@ Slip slipOf(const Configuration& config, const std::string& word, bool mayBeLeve
     }
     const std::string level = levelOfOtherName(bare);
     if (!level.empty() && mayBeLevel) {
-        return {Code::LEVEL_OTHER_NAME, "; the level is called so elsewhere" + reason, level, true};
+        return {Code::LEVEL_OTHER_NAME, "; that is a level name of other libraries" + reason, level,
+                true};
     }
     std::string meant = isKnown(config, bare) ? bare : nearest(config, bare);
     if (meant.empty() && isKnown(config, seen(bare))) meant = seen(bare);

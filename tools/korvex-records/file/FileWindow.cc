@@ -46,7 +46,8 @@ void FileWindow::fill(std::uint64_t offset, std::size_t asked) {
             pread(_fd, _bytes.get() + _held, most - _held, static_cast<off_t>(_start + _held));
         if (got < 0 && errno == EINTR) continue;
         if (got < 0) throw Failure(IO_ERROR, withErrno("cannot read " + _name));
-        if (got == 0) throw Failure(IO_ERROR, _name + ": became shorter while it was read");
+        if (got == 0)
+            throw Failure(IO_ERROR, _name + ": another program shortened it during reading");
         _held += static_cast<std::size_t>(got);
     }
 }

@@ -9,7 +9,7 @@
 std::string readInput(const std::string& name);
 
 // Lines of a file, or of standard input where the name is "-". They can be read again from the
-// start: what is no regular file is copied into an unnamed one first. All members throw Failure
+// start: what is not a regular file is copied into an unnamed one first. All members throw Failure
 // IO_ERROR.
 class LineInput {
   public:

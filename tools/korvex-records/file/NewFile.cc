@@ -82,8 +82,8 @@ void NewFile::replace(OpenFile& old) {
     sync();
     if (!old.isUntouched()) {
         throw Failure(IO_ERROR, old.name() +
-                                    ": another program has changed it meanwhile; it is "
-                                    "as that left it");
+                                    ": another program has changed it meanwhile; "
+                                    "nothing was written");
     }
     if (!_name.renameTo(old.name())) {
         throw Failure(IO_ERROR, withErrno("cannot rename " + _name + " to " + old.name()));

@@ -22,12 +22,12 @@ OpenFile::OpenFile(const Pathname& name, int flags) : _name(name) {
     if (!isThere(name)) throw Failure(IO_ERROR, name + ": no such file");
     // Looked at before it is opened: a FIFO would hold us up for ever.
     if (!name.stat(&_stat)) throw Failure(IO_ERROR, withErrno("cannot look at " + name));
-    if (!S_ISREG(_stat.st_mode)) throw Failure(IO_ERROR, name + ": no regular file");
+    if (!S_ISREG(_stat.st_mode)) throw Failure(IO_ERROR, name + ": not a regular file");
     progressStep("reading", size());
     _fd = FileDescriptor(::open(name.c_str(), flags | O_CLOEXEC | O_NOCTTY));
     if (!_fd.valid() || !_fd.stat(&_stat))
         throw Failure(IO_ERROR, withErrno("cannot open " + name));
-    if (!S_ISREG(_stat.st_mode)) throw Failure(IO_ERROR, name + ": no regular file");
+    if (!S_ISREG(_stat.st_mode)) throw Failure(IO_ERROR, name + ": not a regular file");
 }
 
 StrictReader OpenFile::reader() const {
