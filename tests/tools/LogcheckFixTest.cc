@@ -1,6 +1,7 @@
 #include <gmock/gmock.h>
 
 #include <algorithm>
+#include <cstdint>
 #include <filesystem>
 #include <set>
 #include <string>
@@ -117,10 +118,10 @@ class GeneratedTest : public LogcheckFixTest {
     const std::vector<std::string> tails = {"", " ", " # comment", "# comment", "\t"};
     const std::vector<std::string> ends = {"\n", "\r\n"};
 
-    std::string configuration(std::size_t seed) const {
+    std::string configuration(std::uint64_t seed) const {
         const auto pick = [&](const std::vector<std::string>& from) {
             seed = seed * 6364136223846793005ULL + 1442695040888963407ULL;
-            return from[(seed >> 33U) % from.size()];
+            return from[static_cast<std::size_t>(seed >> 33U) % from.size()];
         };
         const std::string end = pick(ends);
         const std::string prefix = pick(prefixes);

@@ -70,7 +70,7 @@ unsigned forkAndDo(unsigned times, const std::function<void()>& work) {
         if (pid == 0) {
             alarm(10);
             work();
-            _exit(0);
+            testsupport::endForkedChild(0);
         }
         int status = -1;
         if (waitpid(pid, &status, 0) == pid && status == 0) ++well;
@@ -124,7 +124,8 @@ TEST_F(ForkTest, AChildUsesTheStoreWhileTheParentsThreadsPut) {
         const unsigned well = forkAndDo(_times, [&] {
             storesteps::store().setDBFile(Pathname(_dir.file("child")));
             storesteps::put("own", "2", true);
-            if (storesteps::get("own") != "2" || storesteps::get("before") != "1") _exit(1);
+            if (storesteps::get("own") != "2" || storesteps::get("before") != "1")
+                testsupport::endForkedChild(1);
         });
         return well == _times ? 0 : 1;
     });
@@ -146,7 +147,7 @@ TEST_F(ForkTest, NoThreadIsInTheMiddleOfLocalTimeOrOfAnErrorText) {
             while (dwell.count() == 0)
                 std::this_thread::yield();
             const unsigned well = forkAndDo(20, [&] {
-                if (dwell.inside() != 0) _exit(1);
+                if (dwell.inside() != 0) testsupport::endForkedChild(1);
                 __extension__ logger.info("child: %m");
             });
             return well == 20 ? 0 : 1;

@@ -18,7 +18,8 @@ const std::vector<std::string> kLevels = {"debug",    "info",     "notice", "war
 std::string levels(const LineField& level) {
     std::map<std::string, std::vector<std::string>> words;
     for (const LevelWord& word : level.words)
-        if (word.level <= EMERG) words[kLevels[word.level]].push_back(word.word);
+        if (word.level <= EMERG)
+            words[kLevels.at(static_cast<std::size_t>(word.level))].push_back(word.word);
     std::string all;
     for (const auto& [name, these] : words) {
         all += (all.empty() ? "" : ",\n") + std::string("      ") + jsonString(name) + ": " +
