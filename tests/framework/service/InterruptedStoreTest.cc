@@ -120,6 +120,9 @@ TEST_P(InterruptedSave, AnExitInAnotherThreadLeavesABeginningOfIt) {
 }
 
 TEST_P(InterruptedSave, AChildThatIsForkedInItsMidstAndExitsLeavesItAlone) {
+#ifdef __SANITIZE_THREAD__
+    GTEST_SKIP() << "the thread sanitizer takes the parent's thread for one that the child leaks";
+#endif
     const ChildResult result = runInChild(
         [&]() -> int {
             store().setDBFile(Pathname(_file));
