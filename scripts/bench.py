@@ -24,6 +24,7 @@ from bench_rows import BIN, COUNTED, LINEAR, OUT, ROOT, ROWS, contestants, start
 UNSUPPORTED = 3  # exit status of a contestant that cannot do a row
 GROWN = 4 / 3
 SHM = pathlib.Path("/dev/shm")
+PARTIAL = BIN.parent / "rows.json"  # what a run has measured so far
 work = BIN.parent / "work"
 
 
@@ -80,11 +81,10 @@ def measure(row, repeat):
 
 def summary(by_name):
     """Medians and minima with their ratios to the floor's, and Korvex's to the best peer's."""
-    result = {name: {"median": statistics.median(v), "min": min(v)} for name, v in by_name.items()}
-    floor = result["floor"]
-    for figures in result.values():
-        figures["to_floor"] = round(figures["median"] / floor["median"], 3)
-        figures["min_to_floor"] = round(figures["min"] / floor["min"], 3)
+    result = {name: {"median": statistics.median(v)} for name, v in by_name.items()}
+    for name, figures in result.items():
+        figures["to_floor"] = round(figures["median"] / result["floor"]["median"], 3)
+        figures["min_to_floor"] = round(min(by_name[name]) / min(by_name["floor"]), 3)
     best = best_peer(result)
     if best:
         korvex = result["korvex"]
@@ -220,6 +220,7 @@ def main():
     parser.add_argument("--count", action="store_true", help="with --rows: count instructions too")
     parser.add_argument("--dir", type=pathlib.Path, default=work, help="where the files are written")
     parser.add_argument("--redraw", action="store_true", help="only the page and the plots")
+    parser.add_argument("--resume", action="store_true", help="keep the rows of a run that stopped")
     parser.add_argument("--busy", action="store_true", help="measure whoever else is at work")
     options = parser.parse_args()
     bench_quiet.enforced = not options.busy
@@ -231,10 +232,14 @@ def main():
     if options.check:
         return check(rows, options.repeat)
     results = {"machine": machine(options.repeat), "rows": {}}
+    if options.resume:
+        results["rows"] = json.loads(PARTIAL.read_text())
     for row in rows:
-        results["rows"][row] = measure(row, options.repeat)
-        for metric, result in results["rows"][row].items():
-            show(row, metric, result)
+        if row not in results["rows"]:
+            results["rows"][row] = measure(row, options.repeat)
+            for metric, result in results["rows"][row].items():
+                show(row, metric, result)
+            PARTIAL.write_text(json.dumps(results["rows"]))
     if options.count or not options.rows:
         counted = [row for row in COUNTED if row.startswith(wanted) and shutil.which("valgrind")]
         results["instructions"] = {row: instructions(row) for row in counted}

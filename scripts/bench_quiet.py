@@ -4,7 +4,8 @@ import os
 import sys
 import time
 
-TRIES = 20
+TRIES = 10
+MOST = 0.15  # of a processor, that others may use in the quietest run
 TICK = 1 / os.sysconf("SC_CLK_TCK")
 enforced = True  # False: measure whoever else is at work
 
@@ -37,12 +38,20 @@ def kernel():
 
 
 def alone(work):
-    """The result of work(), of a run in which others used less than a twentieth of a processor."""
+    """The result of work(), of a run in which others used less than a twentieth of a processor. Where
+    there is none such, because a hypervisor takes that much, the quietest run counts."""
+    quietest = None
     for _ in range(TRIES):
         before, ours, begin = busy() - kernel(), own(), time.monotonic()
         result = work()
         others = (busy() - kernel() - before) - (own() - ours)
-        if not enforced or others <= 0.05 * (time.monotonic() - begin) + 3 * TICK:
+        wall = time.monotonic() - begin
+        if not enforced or others <= 0.05 * wall + 3 * TICK:
             return result
+        if quietest is None or others / wall < quietest[0]:
+            quietest = (others / wall, result)
         time.sleep(1)
-    sys.exit("bench: somebody else uses the processors; wait for them, or give --busy")
+    if quietest[0] > MOST:
+        sys.exit("bench: somebody else uses the processors; wait for them, or give --busy")
+    print(f"bench: others used {quietest[0]:.0%} of a processor in the quietest run", file=sys.stderr)
+    return quietest[1]
