@@ -7,6 +7,8 @@ target_compile_options(korvex_warnings INTERFACE
   -UKORVEX_QUALIFIED_NAMES
   # __FILE__ in assertions reads "src/..." wherever the tree lies.
   "-fmacro-prefix-map=${PROJECT_SOURCE_DIR}/=")
+# Parts that do not link the library exchange these types with it, too.
+target_compile_definitions(korvex_warnings INTERFACE ${KORVEX_WIDE_TYPES})
 if(KORVEX_RELATIVE_PATHS)
   target_compile_options(korvex_flags INTERFACE
     "-ffile-prefix-map=${PROJECT_SOURCE_DIR}/=" "-ffile-prefix-map=${PROJECT_BINARY_DIR}=.")
