@@ -17,9 +17,8 @@ struct ChildResult {
 // after `seconds`. For whatever a process can do only once.
 ChildResult runInChild(const std::function<int()>& body, unsigned seconds = 60);
 
-// Ends a child that was forked while other threads ran: as _exit(2) does, but the thread sanitizer
-// does not take those threads for ones that the child leaks. Fails if it has reported anything
-// else.
+// Ends a child that was forked while other threads ran, as _exit(2) does. The thread sanitizer,
+// which reports nothing else in such a child, would take those threads for ones that it leaks.
 [[noreturn]] void endForkedChild(int status);
 
 // What the calling child has written to its standard error so far.
