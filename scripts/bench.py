@@ -24,7 +24,7 @@ from bench_rows import BIN, COUNTED, LINEAR, OUT, ROOT, ROWS, contestants, start
 UNSUPPORTED = 3  # exit status of a contestant that cannot do a row
 GROWN = 4 / 3
 SHM = pathlib.Path("/dev/shm")
-PARTIAL = BIN.parent / "rows.json"  # what a run has measured so far
+PARTIAL = BIN.parent / "rows.json"  # what a run of all rows has measured so far
 work = BIN.parent / "work"
 
 
@@ -239,7 +239,8 @@ def main():
             results["rows"][row] = measure(row, options.repeat)
             for metric, result in results["rows"][row].items():
                 show(row, metric, result)
-            PARTIAL.write_text(json.dumps(results["rows"]))
+            if not options.rows:
+                PARTIAL.write_text(json.dumps(results["rows"]))
     if options.count or not options.rows:
         counted = [row for row in COUNTED if row.startswith(wanted) and shutil.which("valgrind")]
         results["instructions"] = {row: instructions(row) for row in counted}
